@@ -1,0 +1,117 @@
+#include "platform/Registry.h"
+#include "tests/support/TestRegistry.h"
+
+#include <QTemporaryDir>
+#include <QTest>
+
+using namespace orvanta;
+
+namespace {
+
+void writeFile(const QString& path, const QByteArray& bytes)
+{
+    QFile f(path);
+    QVERIFY(f.open(QIODevice::WriteOnly));
+    f.write(bytes);
+}
+
+} // namespace
+
+class TestRegistry : public QObject {
+    Q_OBJECT
+
+    QTemporaryDir m_dir;
+
+private Q_SLOTS:
+    void init()
+    {
+        qputenv("VARNIK_HKLM", m_dir.filePath(QStringLiteral("hklm/registry.ini")).toUtf8());
+        qputenv("VARNIK_HKCU", m_dir.filePath(QStringLiteral("hkcu/registry.ini")).toUtf8());
+        qputenv("XDG_CONFIG_HOME", m_dir.filePath(QStringLiteral("config")).toUtf8());
+        QDir(m_dir.path()).removeRecursively();
+        QDir().mkpath(m_dir.path());
+    }
+    void cleanupTestCase()
+    {
+        qunsetenv("VARNIK_HKLM");
+        qunsetenv("VARNIK_HKCU");
+        qunsetenv("XDG_CONFIG_HOME");
+    }
+
+    void readsKeyCaseInsensitively()
+    {
+        QDir().mkpath(m_dir.filePath(QStringLiteral("hklm")));
+        writeFile(Registry::filePath(RegistryRoot::LocalMachine),
+                  "[SOFTWARE\\Varnik\\Rufwarte]\r\nDatabase=/var/lib/calls.fdb\r\nUsername=Y1d0SVh0ZlM=\r\n");
+        Registry reg(RegistryRoot::LocalMachine);
+        QVERIFY(reg.openKeyReadOnly(QStringLiteral("software\\Varnik\\rufwarte")));
+        QCOMPARE(reg.readString(QStringLiteral("database")), QStringLiteral("/var/lib/calls.fdb"));
+        QCOMPARE(reg.readString(QStringLiteral("Username")), QStringLiteral("Y1d0SVh0ZlM="));
+        QCOMPARE(reg.readString(QStringLiteral("Password")), QString());
+        QVERIFY(!reg.valueExists(QStringLiteral("Password")));
+        QVERIFY(reg.openKeyReadOnly(QStringLiteral("\\software\\varnik\\RUFWARTE\\")));
+        QVERIFY(!reg.openKeyReadOnly(QStringLiteral("software\\Varnik")));
+        QCOMPARE(reg.readString(QStringLiteral("Database")), QString());
+        QVERIFY(!reg.writeString(QStringLiteral("x"), QStringLiteral("y")));
+    }
+
+    void missingOrCorruptFileReadsEmpty()
+    {
+        Registry missing(RegistryRoot::LocalMachine);
+        QVERIFY(!missing.openKeyReadOnly(QStringLiteral("software\\Varnik\\rufwarte")));
+        QCOMPARE(missing.readString(QStringLiteral("Database")), QString());
+
+        QDir().mkpath(m_dir.filePath(QStringLiteral("hklm")));
+        writeFile(Registry::filePath(RegistryRoot::LocalMachine), QByteArray("\x00\xFF\xFE[\x01\x02\n=\n\x80\x81", 12));
+        Registry corrupt(RegistryRoot::LocalMachine);
+        QVERIFY(!corrupt.openKeyReadOnly(QStringLiteral("software\\Varnik\\rufwarte")));
+
+        // A directory in place of the file is unreadable, not fatal.
+        QDir().mkpath(Registry::filePath(RegistryRoot::CurrentUser));
+        Registry dirInstead(RegistryRoot::CurrentUser);
+        QVERIFY(!dirInstead.openKeyReadOnly(QStringLiteral("x")));
+        QVERIFY(dirInstead.openKey(QStringLiteral("x"), true));
+        QVERIFY(!dirInstead.writeString(QStringLiteral("a"), QStringLiteral("b")));
+    }
+
+    void writesCreateKeyAndFile()
+    {
+        {
+            Registry reg(RegistryRoot::CurrentUser);
+            QVERIFY(!reg.openKey(QStringLiteral("Software\\Varnik\\rufwarte"), false));
+            QVERIFY(reg.openKey(QStringLiteral("Software\\Varnik\\rufwarte"), true));
+            QVERIFY(reg.writeString(QStringLiteral("Password"), QStringLiteral("VDhaMFZIdzBBY1Vm")));
+            QVERIFY(reg.writeString(QStringLiteral("Name"), QString::fromUtf8("Müller")));
+        }
+        Registry reader(RegistryRoot::CurrentUser);
+        QVERIFY(reader.keyExists(QStringLiteral("software\\varnik\\rufwarte")));
+        QVERIFY(reader.openKeyReadOnly(QStringLiteral("software\\varnik\\rufwarte")));
+        QCOMPARE(reader.readString(QStringLiteral("password")), QStringLiteral("VDhaMFZIdzBBY1Vm"));
+        QCOMPARE(reader.readString(QStringLiteral("name")), QString::fromUtf8("Müller"));
+        // The other root is a different file.
+        Registry machine(RegistryRoot::LocalMachine);
+        QVERIFY(!machine.keyExists(QStringLiteral("software\\varnik\\rufwarte")));
+    }
+
+    void defaultPaths()
+    {
+        qunsetenv("VARNIK_HKLM");
+        qunsetenv("VARNIK_HKCU");
+        QCOMPARE(Registry::filePath(RegistryRoot::LocalMachine), QStringLiteral("/etc/xdg/Varnik/registry.ini"));
+        QCOMPARE(Registry::filePath(RegistryRoot::CurrentUser), m_dir.filePath(QStringLiteral("config/Varnik/registry.ini")));
+    }
+
+    void autostartEntry()
+    {
+        QVERIFY(!autostartEntryExists(QStringLiteral("rufwarte.exe")));
+        QDir().mkpath(m_dir.filePath(QStringLiteral("config/autostart")));
+        writeFile(m_dir.filePath(QStringLiteral("config/autostart/rufwarte.desktop")), "[Desktop Entry]\n");
+        QVERIFY(autostartEntryExists(QStringLiteral("rufwarte.exe")));
+        QVERIFY(autostartEntryExists(QStringLiteral("rufwarte")));
+        QVERIFY(!autostartEntryExists(QString()));
+        QVERIFY(!autostartEntryExists(QStringLiteral(".exe")));
+    }
+};
+
+ORVANTA_TEST(TestRegistry)
+#include "tst_registry.moc"
