@@ -1,6 +1,6 @@
 #include "phone/AreaCodeTable.h"
 
-#include "phone/Windows1252.h"
+#include "platform/Windows1252.h"
 
 #include <QVarLengthArray>
 
@@ -91,7 +91,7 @@ void AreaCodeTable::appendFileContents(QByteArrayView contents)
                 ++digitsEnd;
             if (digitsEnd != line) {
                 append(QString::fromLatin1(line, digitsEnd - line),
-                    decodeWindows1252(QByteArrayView(comma + 1, lineEnd - comma - 1)));
+                    fromWindows1252(QByteArrayView(comma + 1, lineEnd - comma - 1)));
             }
         }
         line = next;

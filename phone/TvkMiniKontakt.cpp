@@ -2,7 +2,7 @@
 
 #include "phone/PhoneErrors.h"
 #include "phone/PhoneNumbers.h"
-#include "phone/Windows1252.h"
+#include "platform/Windows1252.h"
 
 namespace orvanta {
 
@@ -193,7 +193,7 @@ void TvkMiniKontakt::StoreNotes(const QStringList& lines, const QString& text)
         joined += line;
         joined += QLatin1String("\r\n");
     }
-    m_notes = encodeWindows1252(joined);
+    m_notes = toWindows1252(joined);
 }
 
 void TvkMiniKontakt::StoreNotes(const QByteArray& content, const QString& text)
