@@ -1,0 +1,217 @@
+#include "db/FbAttachment.h"
+
+#include "db/FbPrivate_p.h"
+
+#include <QFile>
+
+namespace orvanta {
+
+using namespace Firebird;
+using fbapi::guard;
+
+namespace {
+
+QByteArray dbName(const QString& name)
+{
+    // A server name keeps its "host:" prefix; the path part is a file name in the local encoding.
+    return QFile::encodeName(name);
+}
+
+void fillDpb(IXpbBuilder* dpb, ThrowStatusWrapper* st, const QStringList& params)
+{
+    for (const QString& line : params) {
+        const qsizetype eq = line.indexOf(QLatin1Char('='));
+        const QString key = (eq < 0 ? line : line.left(eq)).trimmed().toLower();
+        const QByteArray value = fbapi::encodeText(eq < 0 ? QString() : line.mid(eq + 1));
+        if (key.isEmpty())
+            continue;
+        if (key == QLatin1String("user_name"))
+            dpb->insertString(st, isc_dpb_user_name, value.constData());
+        else if (key == QLatin1String("password"))
+            dpb->insertString(st, isc_dpb_password, value.constData());
+        else if (key == QLatin1String("lc_ctype"))
+            dpb->insertString(st, isc_dpb_lc_ctype, value.constData());
+        else if (key == QLatin1String("sql_role_name"))
+            dpb->insertString(st, isc_dpb_sql_role_name, value.constData());
+        else
+            throw DatabaseError(QStringLiteral("Unknown connection parameter \"%1\"").arg(key));
+    }
+}
+
+} // namespace
+
+IAttachment* FbAttachment::Private::require() const
+{
+    if (!handle)
+        throw DatabaseError(QStringLiteral("Database not connected"));
+    return handle;
+}
+
+void FbAttachment::Private::releaseDependents()
+{
+    for (FbStatement* s : statements)
+        releaseStatementHandle(*s);
+    for (FbTransaction* t : transactions) {
+        if (!t->isActive())
+            continue;
+        try {
+            if (t->endAction() == FbTransaction::EndAction::Commit)
+                t->commit();
+            else
+                t->rollback();
+        } catch (const DatabaseError&) {
+            t->rollbackQuietly();
+        }
+    }
+}
+
+FbAttachment::FbAttachment()
+    : d(std::make_unique<Private>())
+{
+}
+
+FbAttachment::FbAttachment(QString databaseName, QStringList params)
+    : FbAttachment()
+{
+    d->databaseName = std::move(databaseName);
+    d->params = std::move(params);
+}
+
+FbAttachment::~FbAttachment()
+{
+    try {
+        disconnect();
+    } catch (const DatabaseError&) {
+        // The handle is gone either way; nothing useful to report from a destructor.
+    }
+    for (FbStatement* s : d->statements)
+        detachStatement(*s);
+    for (FbTransaction* t : d->transactions)
+        detachTransaction(*t);
+}
+
+const QString& FbAttachment::databaseName() const { return d->databaseName; }
+void FbAttachment::setDatabaseName(const QString& name) { d->databaseName = name; }
+const QStringList& FbAttachment::params() const { return d->params; }
+QStringList& FbAttachment::params() { return d->params; }
+void FbAttachment::setParams(QStringList params) { d->params = std::move(params); }
+bool FbAttachment::isConnected() const { return d->handle != nullptr; }
+void FbAttachment::setBeforeDisconnect(std::function<void()> hook) { d->beforeDisconnect = std::move(hook); }
+
+void FbAttachment::attach(const QString& databaseName, const QString& user, const QString& password)
+{
+    d->databaseName = databaseName;
+    d->params = {QStringLiteral("user_name=") + user, QStringLiteral("password=") + password,
+                 QStringLiteral("lc_ctype=ISO8859_1")};
+    connect();
+}
+
+void FbAttachment::connect()
+{
+    if (d->handle)
+        return;
+    if (d->databaseName.trimmed().isEmpty())
+        throw DatabaseError(QStringLiteral("Database name is empty"));
+    fbapi::Status st;
+    IXpbBuilder* dpb = nullptr;
+    try {
+        dpb = fbapi::util()->getXpbBuilder(&st, IXpbBuilder::DPB, nullptr, 0);
+        fillDpb(dpb, &st, d->params);
+        IProvider* provider = fbapi::master()->getDispatcher();
+        try {
+            d->handle = provider->attachDatabase(&st, dbName(d->databaseName).constData(),
+                                                 dpb->getBufferLength(&st), dpb->getBuffer(&st));
+        } catch (...) {
+            provider->release();
+            throw;
+        }
+        provider->release();
+        dpb->dispose();
+    } catch (const FbException& e) {
+        if (dpb)
+            dpb->dispose();
+        throw fbapi::toError(e);
+    } catch (...) {
+        if (dpb)
+            dpb->dispose();
+        throw;
+    }
+}
+
+void FbAttachment::disconnect()
+{
+    if (!d->handle)
+        return;
+    if (d->beforeDisconnect)
+        d->beforeDisconnect();
+    d->releaseDependents();
+    IAttachment* handle = d->handle;
+    d->handle = nullptr;
+    fbapi::Status st;
+    try {
+        handle->detach(&st);
+    } catch (const FbException& e) {
+        handle->release();
+        throw fbapi::toError(e);
+    }
+}
+
+void FbAttachment::executeImmediate(const QString& sql, FbTransaction& transaction)
+{
+    IAttachment* att = d->require();
+    ITransaction* tra = transaction.d_func()->handle;
+    if (!tra)
+        throw DatabaseError(QStringLiteral("Transaction is not active"), {}, 0, sql);
+    const QByteArray text = fbapi::encodeText(sql);
+    fbapi::Status st;
+    try {
+        att->execute(&st, tra, 0, text.constData(), SQL_DIALECT_V6, nullptr, nullptr, nullptr, nullptr);
+    } catch (const FbException& e) {
+        throw fbapi::toError(e, sql);
+    }
+}
+
+void FbAttachment::createDatabase(const QString& databaseName, const QString& user, const QString& password,
+                                  int pageSize, bool forcedWrites)
+{
+    fbapi::Status st;
+    IXpbBuilder* dpb = nullptr;
+    IProvider* provider = fbapi::master()->getDispatcher();
+    try {
+        dpb = fbapi::util()->getXpbBuilder(&st, IXpbBuilder::DPB, nullptr, 0);
+        fillDpb(dpb, &st, {QStringLiteral("user_name=") + user, QStringLiteral("password=") + password,
+                           QStringLiteral("lc_ctype=ISO8859_1")});
+        dpb->insertInt(&st, isc_dpb_page_size, pageSize);
+        dpb->insertInt(&st, isc_dpb_sql_dialect, 3);
+        dpb->insertString(&st, isc_dpb_set_db_charset, "ISO8859_1");
+        dpb->insertInt(&st, isc_dpb_force_write, forcedWrites ? 1 : 0);
+        IAttachment* att = provider->createDatabase(&st, dbName(databaseName).constData(), dpb->getBufferLength(&st),
+                                                    dpb->getBuffer(&st));
+        att->detach(&st);
+        dpb->dispose();
+        provider->release();
+    } catch (const FbException& e) {
+        if (dpb)
+            dpb->dispose();
+        provider->release();
+        throw fbapi::toError(e);
+    }
+}
+
+void FbAttachment::dropDatabase()
+{
+    IAttachment* att = d->require();
+    if (d->beforeDisconnect)
+        d->beforeDisconnect();
+    d->releaseDependents();
+    fbapi::Status st;
+    d->handle = nullptr;
+    try {
+        att->dropDatabase(&st);
+    } catch (const FbException& e) {
+        att->release();
+        throw fbapi::toError(e);
+    }
+}
+
+} // namespace orvanta
