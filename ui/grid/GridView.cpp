@@ -1,0 +1,476 @@
+#include "ui/grid/GridView.h"
+
+#include "ui/grid/GridController.h"
+#include "ui/grid/GridGroupBox.h"
+#include "ui/grid/GridHeader.h"
+#include "ui/grid/GridModel.h"
+
+#include <QKeyEvent>
+#include <QMenu>
+#include <QPainter>
+#include <QScrollBar>
+
+namespace orvanta {
+namespace {
+constexpr int kIndent = 16;
+constexpr int kPad = 3;
+} // namespace
+
+GridView::GridView(QWidget* parent)
+    : QAbstractScrollArea(parent)
+    , m_controller(new GridController(this))
+    , m_model(new GridModel(m_controller, this))
+    , m_headerModel(new GridHeaderModel(m_controller, this))
+    , m_header(new GridHeader(m_controller, this))
+    , m_groupBox(new GridGroupBox(m_controller, this))
+{
+    setFocusPolicy(Qt::StrongFocus);
+    viewport()->setBackgroundRole(QPalette::Base);
+    m_header->setModel(m_headerModel);
+    m_header->setGroupByBox(m_groupBox);
+    m_header->setStretchLastSection(true);
+    m_groupBox->hide();
+    m_rowHeight = fontMetrics().height() + 5;
+    verticalScrollBar()->setSingleStep(1);
+    horizontalScrollBar()->setSingleStep(20);
+
+    connect(m_controller, &GridController::columnsChanged, this, &GridView::syncHeader);
+    connect(m_controller, &GridController::layoutChanged, this, [this] {
+        updateGeometries();
+        updateScrollBars();
+        ensureRowVisible(m_controller->focusedRow());
+        viewport()->update();
+    });
+    connect(m_controller, &GridController::focusChanged, this, [this](int, int current) {
+        ensureRowVisible(current);
+        viewport()->update();
+    });
+    connect(m_controller, &GridController::focusedRecordChanged, this, &GridView::focusedRecordChanged);
+
+    connect(m_header, &QHeaderView::sectionMoved, this, [this] {
+        if (m_syncing)
+            return;
+        std::vector<int> order;
+        for (int v = 0; v < m_header->count(); ++v)
+            order.push_back(m_header->logicalIndex(v));
+        m_controller->setColumnOrder(order);
+    });
+    connect(m_header, &QHeaderView::sectionResized, this, [this](int logical, int, int size) {
+        if (m_syncing)
+            return;
+        // The stretched last section follows the view's width; its own width stays as defined.
+        if (m_header->stretchLastSection()) {
+            const std::vector<int> visible = m_controller->visibleColumns();
+            if (!visible.empty() && visible.back() == logical) {
+                viewport()->update();
+                return;
+            }
+        }
+        m_controller->setColumnWidth(logical, size);
+        updateScrollBars();
+        viewport()->update();
+    });
+    connect(m_header, &QHeaderView::sectionClicked, this,
+            [this](int logical) { m_controller->headerClicked(logical, m_header->lastModifiers()); });
+    connect(m_header, &GridHeader::sectionDraggedOut, this, [this](int logical) {
+        m_controller->setColumnVisible(logical, false);
+        Q_EMIT columnDraggedOut(logical);
+    });
+    connect(m_header, &GridHeader::sectionDroppedOnGroupBox, this, [this](int logical) {
+        if (m_controller->isGroupByBoxVisible())
+            m_controller->groupBy(logical);
+    });
+    connect(m_header, &QWidget::customContextMenuRequested, this, &GridView::showHeaderMenu);
+    connect(horizontalScrollBar(), &QScrollBar::rangeChanged, this,
+            [this] { m_header->setOffset(horizontalScrollBar()->value()); });
+    setHeaderHeight(21);
+}
+
+GridView::~GridView() = default;
+
+int GridView::addColumn(GridColumn column)
+{
+    return m_controller->addColumn(std::move(column));
+}
+
+void GridView::setSource(const GridSource* source)
+{
+    m_controller->setSource(source);
+}
+
+void GridView::beginUpdate()
+{
+    if (m_lock++ == 0)
+        viewport()->setUpdatesEnabled(false);
+    m_controller->beginUpdate();
+}
+
+void GridView::endUpdate()
+{
+    if (m_lock == 0)
+        return;
+    m_controller->endUpdate();
+    if (--m_lock == 0) {
+        viewport()->setUpdatesEnabled(true);
+        viewport()->update();
+    }
+}
+
+void GridView::setImages(QList<QPixmap> images)
+{
+    m_images = std::move(images);
+    viewport()->update();
+}
+
+void GridView::setHeaderHeight(int height)
+{
+    m_headerHeight = std::max(height, 8);
+    m_header->setFixedHeight(m_headerHeight);
+    updateGeometries();
+}
+
+void GridView::setAutoWidth(bool on)
+{
+    m_header->setStretchLastSection(on);
+    updateScrollBars();
+}
+
+int GridView::indentWidth() const
+{
+    return static_cast<int>(m_controller->groupedColumns().size()) * kIndent;
+}
+
+int GridView::visibleRowCapacity() const
+{
+    return std::max(1, viewport()->height() / m_rowHeight);
+}
+
+int GridView::firstVisibleRow() const
+{
+    return verticalScrollBar()->value();
+}
+
+QRect GridView::rowRect(int row) const
+{
+    const int y = (row - firstVisibleRow()) * m_rowHeight;
+    if (row < 0 || row >= m_controller->rowCount() || y < 0 || y >= viewport()->height())
+        return {};
+    return {0, y, viewport()->width(), m_rowHeight};
+}
+
+int GridView::rowAt(const QPoint& pos) const
+{
+    if (pos.y() < 0)
+        return -1;
+    const int row = firstVisibleRow() + pos.y() / m_rowHeight;
+    return row < m_controller->rowCount() ? row : -1;
+}
+
+QRect GridView::cellRect(int row, int column) const
+{
+    const QRect r = rowRect(row);
+    if (r.isNull() || column < 0 || column >= m_controller->columnCount() || m_header->isSectionHidden(column))
+        return {};
+    return {indentWidth() + m_header->sectionViewportPosition(column), r.y(), m_header->sectionSize(column), r.height()};
+}
+
+void GridView::scrollToRow(int row)
+{
+    verticalScrollBar()->setValue(row);
+}
+
+void GridView::ensureRowVisible(int row)
+{
+    if (row < 0)
+        return;
+    const int first = firstVisibleRow();
+    const int capacity = visibleRowCapacity();
+    if (row < first)
+        verticalScrollBar()->setValue(row);
+    else if (row >= first + capacity)
+        verticalScrollBar()->setValue(row - capacity + 1);
+}
+
+void GridView::syncHeader()
+{
+    m_syncing = true;
+    m_headerModel->syncColumnCount();
+    m_headerModel->captionsChanged();
+    const int n = m_controller->columnCount();
+    for (int c = 0; c < n; ++c) {
+        const GridColumn& col = m_controller->column(c);
+        if (m_header->isSectionHidden(c) == col.visible)
+            m_header->setSectionHidden(c, !col.visible);
+        if (m_header->sectionSize(c) != col.width)
+            m_header->resizeSection(c, col.width);
+    }
+    const std::vector<int>& order = m_controller->columnOrder();
+    for (int v = 0; v < static_cast<int>(order.size()) && v < m_header->count(); ++v) {
+        const int from = m_header->visualIndex(order[static_cast<size_t>(v)]);
+        if (from != v && from >= 0)
+            m_header->moveSection(from, v);
+    }
+    m_groupBox->setVisible(m_controller->isGroupByBoxVisible());
+    m_groupBox->update();
+    m_syncing = false;
+    updateGeometries();
+    updateScrollBars();
+    m_header->viewport()->update();
+    viewport()->update();
+}
+
+void GridView::updateGeometries()
+{
+    const int box = m_controller->isGroupByBoxVisible() ? m_groupBox->sizeHint().height() : 0;
+    const QMargins margins(0, box + m_headerHeight, 0, 0);
+    if (viewportMargins() != margins)
+        setViewportMargins(margins);
+    const QRect vg = viewport()->geometry();
+    m_groupBox->setGeometry(vg.left(), vg.top() - m_headerHeight - box, vg.width(), box);
+    const int indent = indentWidth();
+    m_header->setGeometry(vg.left() + indent, vg.top() - m_headerHeight, std::max(0, vg.width() - indent), m_headerHeight);
+}
+
+void GridView::updateScrollBars()
+{
+    const int rows = m_controller->rowCount();
+    const int capacity = visibleRowCapacity();
+    verticalScrollBar()->setPageStep(capacity);
+    verticalScrollBar()->setRange(0, std::max(0, rows - capacity));
+    const int total = m_header->length() + indentWidth();
+    horizontalScrollBar()->setPageStep(viewport()->width());
+    horizontalScrollBar()->setRange(0, std::max(0, total - viewport()->width()));
+}
+
+void GridView::resizeEvent(QResizeEvent* event)
+{
+    QAbstractScrollArea::resizeEvent(event);
+    updateGeometries();
+    updateScrollBars();
+}
+
+void GridView::changeEvent(QEvent* event)
+{
+    QAbstractScrollArea::changeEvent(event);
+    if (event->type() == QEvent::FontChange) {
+        m_rowHeight = fontMetrics().height() + 5;
+        updateScrollBars();
+        viewport()->update();
+    }
+}
+
+void GridView::scrollContentsBy(int, int)
+{
+    m_header->setOffset(horizontalScrollBar()->value());
+    viewport()->update();
+}
+
+void GridView::paintEvent(QPaintEvent* event)
+{
+    QPainter p(viewport());
+    p.fillRect(event->rect(), palette().base());
+    const int rows = m_controller->rowCount();
+    const int first = firstVisibleRow();
+    const int last = std::min(rows, first + visibleRowCapacity() + 1);
+    const int focused = m_controller->focusedRow();
+    for (int row = first; row < last; ++row) {
+        const QRect rect(0, (row - first) * m_rowHeight, viewport()->width(), m_rowHeight);
+        if (!rect.intersects(event->rect()))
+            continue;
+        if (m_controller->isGroupRow(row))
+            paintGroupRow(p, row, rect, row == focused);
+        else
+            paintDataRow(p, row, rect, row == focused);
+    }
+}
+
+void GridView::paintGroupRow(QPainter& p, int row, const QRect& rect, bool focused)
+{
+    const int x0 = m_controller->groupLevel(row) * kIndent;
+    const QColor groupColor = m_groupColor.isValid() ? m_groupColor : palette().color(QPalette::Button);
+    p.fillRect(rect, groupColor);
+    const QPalette::ColorGroup cg = hasFocus() ? QPalette::Active : QPalette::Inactive;
+    const QRect textRect(x0 + kIndent + 2, rect.y(), rect.width() - x0 - kIndent - 2, rect.height());
+    if (focused)
+        p.fillRect(QRect(x0 + kIndent, rect.y(), rect.width() - x0 - kIndent, rect.height()), palette().color(cg, QPalette::Highlight));
+    // Expander: a small box with "+" or "-".
+    const QRect box(x0 + (kIndent - 9) / 2, rect.y() + (rect.height() - 9) / 2, 8, 8);
+    p.setPen(palette().color(QPalette::Dark));
+    p.setBrush(palette().base());
+    p.drawRect(box);
+    p.setPen(palette().color(QPalette::Text));
+    p.drawLine(box.left() + 2, box.center().y(), box.right() - 2, box.center().y());
+    if (!m_controller->isGroupExpanded(row))
+        p.drawLine(box.center().x(), box.top() + 2, box.center().x(), box.bottom() - 2);
+    QFont bold = font();
+    bold.setBold(true);
+    p.setFont(bold);
+    p.setPen(focused ? palette().color(cg, QPalette::HighlightedText) : palette().color(QPalette::ButtonText));
+    p.drawText(textRect, Qt::AlignLeft | Qt::AlignVCenter,
+               QFontMetrics(bold).elidedText(m_controller->groupRowText(row), Qt::ElideRight, textRect.width()));
+    p.setFont(font());
+    p.setPen(m_lineColor);
+    p.drawLine(rect.left(), rect.bottom(), rect.right(), rect.bottom());
+}
+
+void GridView::paintDataRow(QPainter& p, int row, const QRect& rect, bool focused)
+{
+    const int indent = indentWidth();
+    if (indent > 0) {
+        const QColor groupColor = m_groupColor.isValid() ? m_groupColor : palette().color(QPalette::Button);
+        p.fillRect(QRect(rect.left(), rect.top(), indent, rect.height()), groupColor);
+    }
+    const int record = m_controller->recordAt(row);
+    const QPalette::ColorGroup cg = hasFocus() ? QPalette::Active : QPalette::Inactive;
+    const GridSource* source = m_controller->source();
+    for (const int c : m_controller->visibleColumns()) {
+        const int x = indent + m_header->sectionViewportPosition(c);
+        const int w = m_header->sectionSize(c);
+        if (x + w < 0 || x > rect.right())
+            continue;
+        const QRect cell(x, rect.y(), w, rect.height());
+        GridCellInfo info;
+        info.row = row;
+        info.record = record;
+        info.column = c;
+        info.rect = cell;
+        info.selected = focused;
+        info.sortedColumn = m_controller->sortIndex(c) >= 0;
+        info.background = focused ? palette().color(cg, QPalette::Highlight)
+                                  : (info.sortedColumn ? m_sortedColor : palette().color(QPalette::Base));
+        info.textColor = focused ? palette().color(cg, QPalette::HighlightedText) : palette().color(QPalette::Text);
+        p.save();
+        p.setClipRect(cell);
+        bool done = false;
+        if (m_cellPainter)
+            done = m_cellPainter(p, info);
+        if (!done) {
+            p.fillRect(cell, info.background);
+            const GridColumn& col = m_controller->column(c);
+            QRect textRect = cell.adjusted(kPad, 0, -kPad, 0);
+            if (col.imageIndex && source && record >= 0) {
+                const int image = col.imageIndex(*source, static_cast<quint32>(record));
+                if (image >= 0 && image < m_images.size()) {
+                    const QPixmap& pm = m_images.at(image);
+                    p.drawPixmap(textRect.left(), cell.top() + (cell.height() - pm.height()) / 2, pm);
+                    textRect.setLeft(textRect.left() + pm.width() + kPad);
+                }
+            }
+            p.setPen(info.textColor);
+            const QString text = record >= 0 ? m_controller->cellText(static_cast<quint32>(record), c) : QString();
+            p.drawText(textRect, static_cast<int>(col.alignment),
+                       fontMetrics().elidedText(text, Qt::ElideRight, textRect.width()));
+        }
+        p.restore();
+        p.setPen(m_lineColor);
+        p.drawLine(cell.right(), cell.top(), cell.right(), cell.bottom());
+    }
+    p.setPen(m_lineColor);
+    p.drawLine(rect.left() + indent, rect.bottom(), rect.right(), rect.bottom());
+}
+
+void GridView::mousePressEvent(QMouseEvent* event)
+{
+    setFocus(Qt::MouseFocusReason);
+    const QPoint pos = event->position().toPoint();
+    const int row = rowAt(pos);
+    if (row < 0)
+        return;
+    m_controller->setFocusedRow(row);
+    if (event->button() == Qt::LeftButton && m_controller->isGroupRow(row)) {
+        const int x0 = m_controller->groupLevel(row) * kIndent;
+        if (pos.x() >= x0 && pos.x() < x0 + kIndent)
+            m_controller->setGroupExpanded(row, !m_controller->isGroupExpanded(row));
+    }
+}
+
+void GridView::mouseDoubleClickEvent(QMouseEvent* event)
+{
+    const int row = rowAt(event->position().toPoint());
+    if (row < 0 || event->button() != Qt::LeftButton)
+        return;
+    if (m_controller->isGroupRow(row)) {
+        const int x0 = m_controller->groupLevel(row) * kIndent;
+        // The expander already toggled on the press.
+        if (event->position().x() >= x0 + kIndent)
+            m_controller->setGroupExpanded(row, !m_controller->isGroupExpanded(row));
+        return;
+    }
+    Q_EMIT rowDoubleClicked(row);
+}
+
+void GridView::contextMenuEvent(QContextMenuEvent* event)
+{
+    const int row = rowAt(event->pos());
+    if (row >= 0)
+        m_controller->setFocusedRow(row);
+    Q_EMIT rowContextMenuRequested(event->globalPos());
+}
+
+void GridView::keyPressEvent(QKeyEvent* event)
+{
+    Q_EMIT keyPressed(event->key(), event->modifiers());
+    const int rows = m_controller->rowCount();
+    const int current = m_controller->focusedRow();
+    const int page = std::max(1, visibleRowCapacity() - 1);
+    int target = current;
+    switch (event->key()) {
+    case Qt::Key_Up:
+        target = current - 1;
+        break;
+    case Qt::Key_Down:
+        target = current + 1;
+        break;
+    case Qt::Key_PageUp:
+        target = current - page;
+        break;
+    case Qt::Key_PageDown:
+        target = current + page;
+        break;
+    case Qt::Key_Home:
+        target = 0;
+        break;
+    case Qt::Key_End:
+        target = rows - 1;
+        break;
+    case Qt::Key_Left:
+    case Qt::Key_Minus:
+        if (m_controller->isGroupRow(current))
+            m_controller->setGroupExpanded(current, false);
+        return;
+    case Qt::Key_Right:
+    case Qt::Key_Plus:
+        if (m_controller->isGroupRow(current))
+            m_controller->setGroupExpanded(current, true);
+        return;
+    default:
+        QAbstractScrollArea::keyPressEvent(event);
+        return;
+    }
+    if (rows > 0)
+        m_controller->setFocusedRow(std::clamp(target, 0, rows - 1));
+}
+
+void GridView::fillColumnMenu(QMenu* menu)
+{
+    for (const int c : m_controller->columnOrder()) {
+        const GridColumn& col = m_controller->column(c);
+        if (!col.showInColumnMenu || col.caption.isEmpty() || m_controller->groupIndex(c) >= 0)
+            continue;
+        QAction* action = menu->addAction(col.caption);
+        action->setCheckable(true);
+        action->setChecked(col.visible);
+        action->setData(c);
+        connect(action, &QAction::toggled, this, [this, c](bool on) { m_controller->setColumnVisible(c, on); });
+    }
+}
+
+void GridView::showHeaderMenu(const QPoint& pos)
+{
+    QMenu menu(this);
+    fillColumnMenu(&menu);
+    if (!menu.isEmpty())
+        menu.exec(m_header->mapToGlobal(pos));
+}
+
+} // namespace orvanta

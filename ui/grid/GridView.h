@@ -1,0 +1,130 @@
+#pragma once
+// The table view of the grid: a read-only, whole-row-focus table painted straight from the
+// controller, so only the rows on screen are ever formatted. Group rows span the width, show
+// "caption: value (count)" and expand or collapse by click, double click or the + / - keys.
+//
+// A frame defines its columns (addColumn), sets a source, listens to focusedRecordChanged and
+// asks controller() for everything else; GridLayoutStore saves and restores what the user
+// changed.
+
+#include "ui/grid/GridColumn.h"
+
+#include <QAbstractScrollArea>
+#include <QPixmap>
+#include <functional>
+
+class QMenu;
+
+namespace orvanta {
+
+class GridController;
+class GridGroupBox;
+class GridHeader;
+class GridHeaderModel;
+class GridModel;
+class GridSource;
+
+// What a custom cell painter gets to know about the cell it may paint.
+struct GridCellInfo {
+    int row = -1;
+    int record = -1;
+    int column = -1;
+    QRect rect;
+    bool selected = false;
+    bool sortedColumn = false;
+    QColor background;
+    QColor textColor;
+};
+
+class GridView final : public QAbstractScrollArea {
+    Q_OBJECT
+    Q_DISABLE_COPY_MOVE(GridView)
+
+public:
+    // Paints a cell completely and returns true, or returns false for the default painting.
+    using CellPainter = std::function<bool(QPainter&, const GridCellInfo&)>;
+
+    explicit GridView(QWidget* parent = nullptr);
+    ~GridView() override;
+
+    [[nodiscard]] GridController* controller() const { return m_controller; }
+    [[nodiscard]] GridModel* model() const { return m_model; }
+    [[nodiscard]] GridHeader* header() const { return m_header; }
+    [[nodiscard]] GridGroupBox* groupByBox() const { return m_groupBox; }
+
+    int addColumn(GridColumn column);
+    void setSource(const GridSource* source);
+
+    // Lock and unlock: changes in between are applied and painted once.
+    void beginUpdate();
+    void endUpdate();
+
+    void setImages(QList<QPixmap> images);
+    [[nodiscard]] const QList<QPixmap>& images() const { return m_images; }
+    void setCellPainter(CellPainter painter) { m_cellPainter = std::move(painter); }
+
+    void setHeaderHeight(int height);
+    [[nodiscard]] int rowHeight() const { return m_rowHeight; }
+    void setSortedColumnColor(const QColor& color) { m_sortedColor = color; viewport()->update(); }
+    [[nodiscard]] QColor sortedColumnColor() const { return m_sortedColor; }
+    void setGridLineColor(const QColor& color) { m_lineColor = color; viewport()->update(); }
+    void setGroupRowColor(const QColor& color) { m_groupColor = color; viewport()->update(); }
+    // Columns stretch to fill the width (the last one takes the rest).
+    void setAutoWidth(bool on);
+
+    // Viewport geometry of a row, empty when it is scrolled out.
+    [[nodiscard]] QRect rowRect(int row) const;
+    [[nodiscard]] int rowAt(const QPoint& viewportPos) const;
+    [[nodiscard]] QRect cellRect(int row, int column) const;
+    [[nodiscard]] int firstVisibleRow() const;
+    void scrollToRow(int row);
+
+    // Check items for the visible state of every column offered in the column menu.
+    void fillColumnMenu(QMenu* menu);
+
+Q_SIGNALS:
+    void focusedRecordChanged();
+    void rowDoubleClicked(int row);
+    // Before the view handles a key: frames defer work on navigation keys or act on Delete.
+    void keyPressed(int key, Qt::KeyboardModifiers modifiers);
+    void rowContextMenuRequested(const QPoint& globalPos);
+    void columnDraggedOut(int column);
+
+protected:
+    void paintEvent(QPaintEvent* event) override;
+    void resizeEvent(QResizeEvent* event) override;
+    void mousePressEvent(QMouseEvent* event) override;
+    void mouseDoubleClickEvent(QMouseEvent* event) override;
+    void keyPressEvent(QKeyEvent* event) override;
+    void contextMenuEvent(QContextMenuEvent* event) override;
+    void scrollContentsBy(int dx, int dy) override;
+    void changeEvent(QEvent* event) override;
+
+private:
+    void syncHeader();
+    void updateGeometries();
+    void updateScrollBars();
+    void ensureRowVisible(int row);
+    [[nodiscard]] int indentWidth() const;
+    [[nodiscard]] int visibleRowCapacity() const;
+    void paintGroupRow(QPainter& p, int row, const QRect& rect, bool focused);
+    void paintDataRow(QPainter& p, int row, const QRect& rect, bool focused);
+    void showHeaderMenu(const QPoint& pos);
+
+    GridController* m_controller;
+    GridModel* m_model;
+    GridHeaderModel* m_headerModel;
+    GridHeader* m_header;
+    GridGroupBox* m_groupBox;
+    QList<QPixmap> m_images;
+    CellPainter m_cellPainter;
+    QColor m_sortedColor{0xEF, 0xEF, 0xEF};
+    QColor m_lineColor{0xC0, 0xC0, 0xC0};
+    QColor m_groupColor;
+    int m_rowHeight = 18;
+    int m_headerHeight = 21;
+    int m_lock = 0;
+    bool m_syncing = false;
+};
+
+} // namespace orvanta
