@@ -3,6 +3,7 @@
 // speaks Qt; these helpers turn client status into DatabaseError and database text into QString.
 
 #include "db/DatabaseError.h"
+#include "db/DbText.h"
 
 #include <firebird/Interface.h>
 
@@ -43,11 +44,8 @@ auto guard(F&& f, const QString& context = {}) -> decltype(f())
     }
 }
 
-// Database text is ISO 8859-1. Bytes 0x80-0x9F are read as the Windows characters the monitor's
-// Windows clients stored there (the euro sign above all), and written back the same way, so such
-// text survives a round trip instead of turning into control characters.
-[[nodiscard]] QString decodeText(const char* data, qsizetype size);
-[[nodiscard]] QByteArray encodeText(QStringView text);
+[[nodiscard]] inline QString decodeText(const char* data, qsizetype size) { return decodeDbText(data, size); }
+[[nodiscard]] inline QByteArray encodeText(QStringView text) { return encodeDbText(text); }
 
 // Dates: days since 17 Nov 1858; times: 1/10000 s since midnight.
 [[nodiscard]] inline qint64 julianDayFromIsc(ISC_DATE d) { return qint64(d) + 2400001; }

@@ -11,6 +11,8 @@ using fbapi::guard;
 
 namespace {
 
+constexpr int kConnectTimeoutSeconds = 15;
+
 QByteArray dbName(const QString& name)
 {
     // A server name keeps its "host:" prefix; the path part is a file name in the local encoding.
@@ -33,6 +35,8 @@ void fillDpb(IXpbBuilder* dpb, ThrowStatusWrapper* st, const QStringList& params
             dpb->insertString(st, isc_dpb_lc_ctype, value.constData());
         else if (key == QLatin1String("sql_role_name"))
             dpb->insertString(st, isc_dpb_sql_role_name, value.constData());
+        else if (key == QLatin1String("connect_timeout"))
+            dpb->insertInt(st, isc_dpb_connect_timeout, value.toInt());
         else
             throw DatabaseError(QStringLiteral("Unknown connection parameter \"%1\"").arg(key));
     }
@@ -117,6 +121,10 @@ void FbAttachment::connect()
     try {
         dpb = fbapi::util()->getXpbBuilder(&st, IXpbBuilder::DPB, nullptr, 0);
         fillDpb(dpb, &st, d->params);
+        // A server that does not answer must not hold the program for the client's default
+        // three minutes.
+        if (!dpb->findFirst(&st, isc_dpb_connect_timeout))
+            dpb->insertInt(&st, isc_dpb_connect_timeout, kConnectTimeoutSeconds);
         IProvider* provider = fbapi::master()->getDispatcher();
         try {
             d->handle = provider->attachDatabase(&st, dbName(d->databaseName).constData(),

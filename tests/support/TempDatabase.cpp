@@ -3,6 +3,7 @@
 #include "db/DatabaseError.h"
 #include "db/FbStatement.h"
 #include "db/FbTransaction.h"
+#include "db/Schema.h"
 #include "db/SqlScript.h"
 #include "tests/TestPaths.h"
 
@@ -26,14 +27,8 @@ Templates& templates()
 
 QString makeTemplate(TempDatabase::Schema schema)
 {
-    QByteArray script;
-    if (schema == TempDatabase::Schema::Full) {
-        QFile f(TempDatabase::schemaPath());
-        if (!f.open(QIODevice::ReadOnly))
-            throw DatabaseError(QStringLiteral("Cannot read %1: %2").arg(f.fileName(), f.errorString()));
-        script = f.readAll();
-    }
-    const QByteArray key = QCryptographicHash::hash(script, QCryptographicHash::Sha1);
+    const QString script = schema == TempDatabase::Schema::Full ? schemaScript() : QString();
+    const QByteArray key = QCryptographicHash::hash(script.toUtf8(), QCryptographicHash::Sha1);
     Templates& t = templates();
     if (const auto it = t.byScript.constFind(key); it != t.byScript.constEnd())
         return *it;
@@ -43,7 +38,7 @@ QString makeTemplate(TempDatabase::Schema schema)
     if (!script.isEmpty()) {
         FbAttachment db;
         db.attach(path, QString::fromLatin1(TempDatabase::User), QString::fromLatin1(TempDatabase::Password));
-        SqlScript::runFile(db, TempDatabase::schemaPath());
+        SqlScript::run(db, script);
         db.disconnect();
     }
     t.byScript.insert(key, path);
