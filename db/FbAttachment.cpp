@@ -2,7 +2,6 @@
 
 #include "db/FbPrivate_p.h"
 
-#include <QFile>
 
 namespace orvanta {
 
@@ -13,18 +12,20 @@ namespace {
 
 constexpr int kConnectTimeoutSeconds = 15;
 
+// With isc_dpb_utf8_filename the engine takes the database name and every text of the parameter
+// block as UTF-8, whatever the process locale, so names and passwords with umlauts survive.
 QByteArray dbName(const QString& name)
 {
-    // A server name keeps its "host:" prefix; the path part is a file name in the local encoding.
-    return QFile::encodeName(name);
+    return name.toUtf8();
 }
 
 void fillDpb(IXpbBuilder* dpb, ThrowStatusWrapper* st, const QStringList& params)
 {
+    dpb->insertTag(st, isc_dpb_utf8_filename);
     for (const QString& line : params) {
         const qsizetype eq = line.indexOf(QLatin1Char('='));
         const QString key = (eq < 0 ? line : line.left(eq)).trimmed().toLower();
-        const QByteArray value = fbapi::encodeText(eq < 0 ? QString() : line.mid(eq + 1));
+        const QByteArray value = (eq < 0 ? QString() : line.mid(eq + 1)).toUtf8();
         if (key.isEmpty())
             continue;
         if (key == QLatin1String("user_name"))

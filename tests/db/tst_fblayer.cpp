@@ -47,7 +47,7 @@ private Q_SLOTS:
     void errorsCarryCode();
     void transactionStates();
     void nowaitWriteFailsAtOnce();
-    void missingDatabase();
+    void attachAndCreate();
 };
 
 void TstFbLayer::namedParameterParsing_data()
@@ -372,7 +372,7 @@ void TstFbLayer::nowaitWriteFailsAtOnce()
     otherTx.rollback();
 }
 
-void TstFbLayer::missingDatabase()
+void TstFbLayer::attachAndCreate()
 {
     QTemporaryDir dir;
     FbAttachment a;
@@ -388,6 +388,18 @@ void TstFbLayer::missingDatabase()
     QVERIFY_THROWS_EXCEPTION(DatabaseError, empty.connect());
     FbAttachment wrongParam(dir.filePath(QStringLiteral("x.fdb")), {QStringLiteral("colour=blue")});
     QVERIFY_THROWS_EXCEPTION(DatabaseError, wrongParam.connect());
+
+    // Umlauts in the file name and in the credentials pass whatever the process locale.
+    const QString path = dir.filePath(QStringLiteral("Büro-Ä.fdb"));
+    FbAttachment::createDatabase(path, QStringLiteral("SYSDBA"), QStringLiteral("Schlüssel"), 4096, false);
+    QVERIFY(QFile::exists(path));
+    FbAttachment created;
+    created.attach(path, QStringLiteral("SYSDBA"), QStringLiteral("Schlüssel"));
+    QVERIFY(created.isConnected());
+    QVERIFY_THROWS_EXCEPTION(DatabaseError,
+                             FbAttachment::createDatabase(path, QStringLiteral("SYSDBA"), QStringLiteral("x")));
+    created.dropDatabase();
+    QVERIFY(!QFile::exists(path));
 }
 
 ORVANTA_TEST(TstFbLayer)
