@@ -75,15 +75,28 @@ QList<SqlScript::Statement> SqlScript::split(QStringView script)
 
     auto finish = [&](qsizetype end) {
         const QString raw = script.mid(start, end - start).toString();
-        // The statement starts at its first non-blank character.
+        // The statement starts after the blanks and comments in front of it.
         int lead = 0;
         qsizetype k = 0;
-        while (k < raw.size() && raw[k].isSpace()) {
-            if (raw[k] == QLatin1Char('\n'))
-                ++lead;
-            ++k;
+        for (;;) {
+            while (k < raw.size() && raw[k].isSpace()) {
+                if (raw[k] == QLatin1Char('\n'))
+                    ++lead;
+                ++k;
+            }
+            if (raw.mid(k, 2) == QLatin1String("--")) {
+                while (k < raw.size() && raw[k] != QLatin1Char('\n'))
+                    ++k;
+            } else if (raw.mid(k, 2) == QLatin1String("/*")) {
+                const qsizetype close = raw.indexOf(QLatin1String("*/"), k + 2);
+                const qsizetype stop = close < 0 ? raw.size() : close + 2;
+                lead += int(QStringView(raw).mid(k, stop - k).count(QLatin1Char('\n')));
+                k = stop;
+            } else {
+                break;
+            }
         }
-        const QString text = raw.trimmed();
+        const QString text = raw.mid(k).trimmed();
         const QString bare = stripComments(text);
         if (!bare.isEmpty()) {
             const auto m = setTerm.match(bare);
