@@ -68,6 +68,8 @@ void IniFile::parse(QByteArrayView bytes)
     } else {
         text = fromWindows1252(bytes);
     }
+    // NUL bytes carry nothing in a text file; dropping them first keeps names trimmable.
+    text.remove(QChar(0));
 
     Section* current = nullptr;
     bool currentIsDuplicate = false;
@@ -84,7 +86,7 @@ void IniFile::parse(QByteArrayView bytes)
             continue;
         if (line.front() == u'[') {
             const qsizetype close = line.indexOf(u']');
-            const QString name = trimBlanks(line.mid(1, close < 0 ? -1 : close - 1)).toString().remove(QChar(0));
+            const QString name = trimBlanks(line.mid(1, close < 0 ? -1 : close - 1)).toString();
             const QString folded = fold(name);
             // Later duplicates of a section are invisible, as with the Windows profile functions.
             currentIsDuplicate = m_sectionIndex.contains(folded);
@@ -100,11 +102,11 @@ void IniFile::parse(QByteArrayView bytes)
         const qsizetype eq = line.indexOf(u'=');
         if (eq <= 0)
             continue;
-        const QString key = trimBlanks(line.left(eq)).toString().remove(QChar(0));
+        const QString key = trimBlanks(line.left(eq)).toString();
         if (key.isEmpty())
             continue;
         if (findEntry(*current, key) == nullptr)
-            addEntry(*current, key, trimBlanks(line.mid(eq + 1)).toString().remove(QChar(0)));
+            addEntry(*current, key, trimBlanks(line.mid(eq + 1)).toString());
     }
 }
 
