@@ -13,6 +13,16 @@ namespace orvanta {
 enum class GridSortOrder : quint8 { None, Ascending, Descending };
 
 struct GridColumn {
+    GridColumn() = default;
+    GridColumn(QString name, QString fieldName, QString caption = {}, int tag = 0, int width = 64)
+        : name(std::move(name))
+        , fieldName(std::move(fieldName))
+        , caption(std::move(caption))
+        , tag(tag)
+        , width(width)
+    {
+    }
+
     // Unique name (the column's objectName); the layout store keys on it.
     QString name;
     // Source field by name; resolved when the source is set. Empty for a column without field.
