@@ -100,8 +100,9 @@ void AreaCodeTable::appendFileContents(QByteArrayView contents)
 
 bool AreaCodeTable::lookup(QStringView number, QString& prefix, QString& rest, QString& region) const
 {
-    prefix.clear();
-    rest.clear();
+    // truncate keeps the outputs' buffers, so a caller looking up many numbers allocates nothing.
+    prefix.truncate(0);
+    rest.truncate(0);
     region.clear();
     if (m_codes.isEmpty() || m_names.isEmpty())
         return false;
@@ -138,14 +139,14 @@ bool AreaCodeTable::lookup(QStringView number, QString& prefix, QString& rest, Q
     }
 
     if (hit < 0) {
-        rest = number.toString();
+        rest.append(number);
         return true;
     }
     region = m_names.at(hit);
     // The match is the start of the significant digits, so its first occurrence in the dialled
     // digits ends right after them: the prefix keeps the zeros the caller dialled.
-    prefix = QString(reinterpret_cast<const QChar*>(digits.constData()), zeros + hitLength);
-    rest = QString(reinterpret_cast<const QChar*>(significant + restFrom), significantCount - restFrom);
+    prefix.append(reinterpret_cast<const QChar*>(digits.constData()), zeros + hitLength);
+    rest.append(reinterpret_cast<const QChar*>(significant + restFrom), significantCount - restFrom);
     return true;
 }
 

@@ -156,7 +156,11 @@ private Q_SLOTS:
         QCOMPARE(region, QString::fromUtf8("München"));
         QVERIFY(GetGermanAereaCodes(u"033814711", prefix, rest, region));
         QCOMPARE(region, QStringLiteral("Brandenburg an der Havel"));
+        QCOMPARE(prefix, QStringLiteral("03381")); // outputs of the previous lookup are replaced
         QCOMPARE(rest, QStringLiteral("4711"));
+        QVERIFY(GetGermanAereaCodes(u"0190 12", prefix, rest, region));
+        QCOMPARE(prefix, QString());
+        QCOMPARE(rest, QStringLiteral("0190 12"));
         QVERIFY(GetAustriaAereaCodes(u"0316 123", prefix, rest, region));
         QCOMPARE(region, QStringLiteral("Graz"));
         QVERIFY(GetSwissAereaCodes(u"044 1234567", prefix, rest, region));
