@@ -1,8 +1,9 @@
 #include "phone/AreaCodes.h"
 
-#include "phone/PhoneErrors.h"
+#include "platform/AppException.h"
+#include "platform/ErrorLog.h"
+#include "platform/ProgramFolder.h"
 
-#include <QCoreApplication>
 #include <QDir>
 #include <QFile>
 #include <QFileInfo>
@@ -11,11 +12,6 @@ namespace orvanta {
 
 namespace {
 
-QString programFolder()
-{
-    return QCoreApplication::applicationDirPath();
-}
-
 void loadTable(AreaCodeTable& table, const QString& folder, const char* fileName, const char* operation)
 {
     const QString header = QStringLiteral("# Orvex - ") + QLatin1String(operation);
@@ -23,7 +19,7 @@ void loadTable(AreaCodeTable& table, const QString& folder, const char* fileName
         table.clear();
         const QString path = QDir(folder).filePath(QLatin1String(fileName));
         if (!QFileInfo(path).isFile()) {
-            phoneLogError(header + QStringLiteral("\r\nDatei nicht gefunden!"));
+            logError(header + QStringLiteral("\r\nDatei nicht gefunden!"));
             return;
         }
         QFile file(path);
@@ -33,11 +29,8 @@ void loadTable(AreaCodeTable& table, const QString& folder, const char* fileName
         if (file.error() != QFileDevice::NoError)
             throw AppException(QStringLiteral("Fehler beim Lesen der Datei \"%1\". %2").arg(path, file.errorString()));
         table.appendFileContents(contents);
-    } catch (const AppException& e) {
-        phoneShowError(header, &e);
     } catch (const std::exception& e) {
-        const AppException wrapped(QString::fromLocal8Bit(e.what()));
-        phoneShowError(header, &wrapped);
+        reportError(header, &e);
     }
 }
 
@@ -47,8 +40,7 @@ bool lookupIn(const AreaCodeTable& table, const char* header, QStringView number
     try {
         return table.lookup(number, prefix, rest, region);
     } catch (const std::exception& e) {
-        const AppException wrapped(QString::fromLocal8Bit(e.what()));
-        phoneShowError(QLatin1String(header), &wrapped);
+        reportError(QLatin1String(header), &e);
         return false;
     }
 }

@@ -1,6 +1,7 @@
 #include "phone/TvkMiniKontakt.h"
 
-#include "phone/PhoneErrors.h"
+#include "platform/AppException.h"
+#include "platform/ErrorLog.h"
 #include "phone/PhoneNumbers.h"
 #include "platform/Windows1252.h"
 
@@ -31,11 +32,8 @@ auto guarded(const char* operation, Operation&& run, decltype(run()) failed) -> 
     const QString header = QStringLiteral("# TvkMiniKontakt - ") + QLatin1String(operation);
     try {
         return run();
-    } catch (const AppException& e) {
-        phoneShowError(header, &e);
     } catch (const std::exception& e) {
-        const AppException wrapped(QString::fromLocal8Bit(e.what()));
-        phoneShowError(header, &wrapped);
+        reportError(header, &e);
     }
     return failed;
 }

@@ -1,5 +1,6 @@
 #include "phone/AreaCodes.h"
 #include "tests/TestPaths.h"
+#include "tests/phone/ErrorLogFixture.h"
 #include "tests/support/TestRegistry.h"
 
 #include <QFile>
@@ -170,6 +171,7 @@ private Q_SLOTS:
 
     void loadReplacesAndMissingFileEmpties()
     {
+        test::ErrorLogFixture log;
         QTemporaryDir dir;
         writeFile(dir.filePath("AreaCodes_CH"), "1,Eins\n");
         LoadSwissAereaCodes(dir.path());
@@ -184,6 +186,25 @@ private Q_SLOTS:
         LoadSwissAereaCodes(dir.path());
         QVERIFY(swissAreaCodes().isEmpty());
         QVERIFY(!GetSwissAereaCodes(u"02", prefix, rest, region));
+        // A missing file is only written to the log, never shown.
+        QVERIFY(log.logged().contains("\r\n# Orvex - LoadSwissAereaCodes\r\nDatei nicht gefunden!\r\n\r\n"));
+        QCOMPARE(log.dialogs().count(), 0);
+    }
+
+    void unreadableFileIsShown()
+    {
+        test::ErrorLogFixture log;
+        QTemporaryDir dir;
+        const QString path = dir.filePath("AreaCodes_A");
+        writeFile(path, "1,Wien\n");
+        QVERIFY(QFile::setPermissions(path, QFileDevice::Permissions()));
+        if (QFile file(path); file.open(QIODevice::ReadOnly))
+            QSKIP("permissions do not apply to this user");
+        LoadAustriaAereaCodes(dir.path());
+        QVERIFY(austrianAreaCodes().isEmpty());
+        QCOMPARE(log.dialogs().count(DialogKind::Error), 1);
+        QVERIFY(log.dialogs().last().text.startsWith(QStringLiteral("# Orvex - LoadAustriaAereaCodes\r\n")));
+        QVERIFY(log.logged().contains("# Orvex - LoadAustriaAereaCodes\r\n"));
     }
 };
 

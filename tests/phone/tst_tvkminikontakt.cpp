@@ -1,4 +1,5 @@
 #include "phone/TvkMiniKontakt.h"
+#include "tests/phone/ErrorLogFixture.h"
 #include "tests/support/TestRegistry.h"
 
 #include <QTest>
@@ -138,6 +139,7 @@ private Q_SLOTS:
 
     void indexOutsideListIsRefused()
     {
+        test::ErrorLogFixture log;
         TvkMiniKontakt contact;
         contact.AddKD(number("", "030", "1"));
         contact.AddMail(mail("a@example.org", EntryStatus::New));
@@ -149,6 +151,11 @@ private Q_SLOTS:
         QCOMPARE(contact.KD().at(0).NUMBER, QStringLiteral("1"));
         QCOMPARE(contact.KD().at(0).status, EntryStatus::New);
         QCOMPARE(contact.Mail().at(0).status, EntryStatus::New);
+        const QStringList shown = log.dialogs().texts(DialogKind::Error);
+        QCOMPARE(shown.size(), 4);
+        QVERIFY(shown.at(0).startsWith(QStringLiteral("# TvkMiniKontakt - EditKD\r\n")));
+        QVERIFY(shown.at(3).startsWith(QStringLiteral("# TvkMiniKontakt - DeleteMail\r\n")));
+        QVERIFY(log.logged().contains("# TvkMiniKontakt - DeleteKD\r\n"));
     }
 
     void storesNotes()
