@@ -1,8 +1,9 @@
-// orvanta-createdb <database> [--user U] [--password P] [--demo]
+// orvanta-createdb <database> [--user U] [--password P] [--demo] [--calls N [--seed S]]
 //
 // Creates a call database (a plain path: embedded engine; "host:path": through a server) and
 // builds the tables, views and procedures in it. --demo adds contacts and calls to try things
-// out. Exit code 0 on success; otherwise a message on stderr and a non-zero code.
+// out; --calls adds N generated calls (large logs for measurements). Exit code 0 on success;
+// otherwise a message on stderr and a non-zero code.
 
 #include "db/DatabaseError.h"
 #include "db/FbAttachment.h"
@@ -12,6 +13,7 @@
 
 #include <QCommandLineParser>
 #include <QCoreApplication>
+#include <QElapsedTimer>
 #include <QFileInfo>
 
 #include <cstdio>
@@ -53,7 +55,13 @@ int main(int argc, char* argv[])
     const QCommandLineOption demoOpt(QStringLiteral("demo"), QStringLiteral("Beispielkontakte und -anrufe eintragen"));
     parser.addOption(userOpt);
     parser.addOption(passwordOpt);
+    const QCommandLineOption callsOpt(QStringLiteral("calls"), QStringLiteral("so viele erzeugte Anrufe eintragen"),
+                                      QStringLiteral("n"));
+    const QCommandLineOption seedOpt(QStringLiteral("seed"), QStringLiteral("Startwert der erzeugten Anrufe (Vorgabe 1)"),
+                                     QStringLiteral("s"), QStringLiteral("1"));
     parser.addOption(demoOpt);
+    parser.addOption(callsOpt);
+    parser.addOption(seedOpt);
     parser.process(app);
 
     const QStringList args = parser.positionalArguments();
@@ -62,6 +70,23 @@ int main(int argc, char* argv[])
         return 2;
     }
     const QString database = args.first();
+    bool numbersOk = true;
+    qint64 calls = 0;
+    quint32 seed = 1;
+    if (parser.isSet(callsOpt)) {
+        bool ok = false;
+        calls = parser.value(callsOpt).toLongLong(&ok);
+        numbersOk = ok && calls >= 0;
+    }
+    {
+        bool ok = false;
+        seed = parser.value(seedOpt).toUInt(&ok);
+        numbersOk = numbersOk && ok;
+    }
+    if (!numbersOk) {
+        print(stderr, QStringLiteral("--calls und --seed erwarten eine nicht negative ganze Zahl."));
+        return 2;
+    }
     const QString user = parser.value(userOpt);
     const QString password = parser.value(passwordOpt);
 
@@ -108,6 +133,17 @@ int main(int argc, char* argv[])
                               .arg(s.linkedCalls));
         } catch (const orvanta::AppException& e) {
             print(stderr, QStringLiteral("Die Beispieldaten konnten nicht eingetragen werden:\n%1").arg(e.message()));
+            return 1;
+        }
+    }
+    if (calls > 0) {
+        try {
+            QElapsedTimer timer;
+            timer.start();
+            const qint64 n = orvanta::demo::generateCalls(db, calls, seed);
+            print(stdout, QStringLiteral("%1 Anrufe erzeugt in %2 s.").arg(n).arg(double(timer.elapsed()) / 1000.0, 0, 'f', 1));
+        } catch (const orvanta::AppException& e) {
+            print(stderr, QStringLiteral("Die Anrufe konnten nicht erzeugt werden:\n%1").arg(e.message()));
             return 1;
         }
     }

@@ -102,15 +102,15 @@ CallRow CallFactory::randomCall(const QDate& day)
         Caller c;
         c.number = kind < 4 ? text("Nummer unterdrückt") : kind < 6 ? QStringLiteral("Unbekannt") : QString();
         c.ntype = 0;
-        CallRow row = callWith(day, c);
-        row.ctype = 0;
+        // Only incoming calls can have a withheld caller.
+        CallRow row = callWith(day, c, 0);
         row.present = kind < 4 ? 1 : 2;
         return row;
     }
     return callWith(day, randomCaller());
 }
 
-CallRow CallFactory::callWith(const QDate& day, const Caller& caller)
+CallRow CallFactory::callWith(const QDate& day, const Caller& caller, int ctype)
 {
     CallRow row;
     row.date = day;
@@ -121,7 +121,7 @@ CallRow CallFactory::callWith(const QDate& day, const Caller& caller)
     row.region = caller.region;
     row.ntype = caller.ntype;
     const int dir = int(m_rng.bounded(100));
-    row.ctype = dir < 70 ? 0 : dir < 97 ? 1 : 2;
+    row.ctype = ctype >= 0 ? ctype : dir < 70 ? 0 : dir < 97 ? 1 : 2;
     row.service = pickService(m_rng);
     const Line& line = ownLines[m_rng.bounded(int(ownLines.size()))];
     row.onMsn = QString::fromLatin1(line.msn);

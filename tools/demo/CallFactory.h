@@ -51,8 +51,8 @@ public:
 
     // A call on the given day from (or, outgoing, to) a random number; every field filled.
     [[nodiscard]] CallRow randomCall(const QDate& day);
-    // The same, with the number given (a known contact's).
-    [[nodiscard]] CallRow callWith(const QDate& day, const Caller& caller);
+    // The same, with the number given (a known contact's); ctype -1 picks the direction.
+    [[nodiscard]] CallRow callWith(const QDate& day, const Caller& caller, int ctype = -1);
 
     [[nodiscard]] Caller randomCaller();
     // A day within the given number of days up to lastDay, recent days more likely.

@@ -147,6 +147,13 @@ std::vector<CallRow> makeCalls(const std::vector<StoredContact>& contacts, const
             rows.push_back(factory.randomCall(day));
         }
     }
+    // Calls of the current day lie before the current time.
+    if (today == Clock::today()) {
+        const int nowSecs = QTime(0, 0).secsTo(Clock::now().time());
+        for (CallRow& r : rows)
+            if (r.date == today && QTime(0, 0).secsTo(r.time) > nowSecs)
+                r.time = QTime(0, 0).addSecs(factory.bounded(nowSecs + 1));
+    }
     std::stable_sort(rows.begin(), rows.end(), [](const CallRow& a, const CallRow& b) {
         return a.date != b.date ? a.date < b.date : a.time < b.time;
     });

@@ -8,6 +8,8 @@
 //
 // Both commit on success, roll back and throw DatabaseError on failure.
 
+#include "platform/Clock.h"
+
 #include <QDate>
 
 namespace orvanta {
@@ -26,11 +28,11 @@ struct DemoStats {
 };
 
 // today: the last day that receives calls (a few of them on that day itself).
-DemoStats fillDemo(FbAttachment& attachment, const QDate& today = QDate::currentDate());
+DemoStats fillDemo(FbAttachment& attachment, const QDate& today = Clock::today());
 
 // Calls spread over the 365 days up to lastDay; the same seed gives the same rows.
 // Returns the number of rows inserted.
 qint64 generateCalls(FbAttachment& attachment, qint64 count, quint32 seed,
-                     const QDate& lastDay = QDate::currentDate());
+                     const QDate& lastDay = Clock::today());
 
 } // namespace orvanta::demo
