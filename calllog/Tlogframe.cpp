@@ -1,0 +1,1055 @@
+#include "calllog/Tlogframe.h"
+
+#include "calllog/LogImages.h"
+#include "calllog/RecordStoreGridSource.h"
+#include "db/TDM2.h"
+#include "phone/PhoneNumbers.h"
+#include "platform/AppException.h"
+#include "platform/BusyCursor.h"
+#include "platform/Clock.h"
+#include "platform/ErrorLog.h"
+#include "platform/ProgramFolder.h"
+#include "platform/WindowMessages.h"
+#include "ui/grid/GridController.h"
+#include "ui/grid/GridLayoutStore.h"
+#include "ui/grid/GridView.h"
+#include "ui/label/TVKCutLabel.h"
+#include "ui/scheme/ColorScheme.h"
+
+#include <QAction>
+#include <QApplication>
+#include <QCheckBox>
+#include <QComboBox>
+#include <QHBoxLayout>
+#include <QLabel>
+#include <QLineEdit>
+#include <QMenu>
+#include <QPainter>
+#include <QPushButton>
+#include <QStyle>
+#include <QVBoxLayout>
+
+#include <array>
+
+namespace orvanta {
+namespace {
+
+const QString kLabel = QStringLiteral("# Logframe - ");
+const QString kView = QStringLiteral("2");
+constexpr QByteArrayView kUnbekannt("Unbekannt");
+constexpr QByteArrayView kEingang("Eingang");
+constexpr QByteArrayView kAusgang("Ausgang");
+
+// Column names of the view, also the layout file's keys.
+const QString kPrefix = QStringLiteral("cxGrid1DBTableView1");
+
+QString columnName(const char* field)
+{
+    return kPrefix + QLatin1String(field);
+}
+
+// The service names as the bytes the grid sorts by; built once, kept for the program's life.
+QByteArrayView serviceNameBytes(qint64 code)
+{
+    static const std::array<QByteArray, 23> names = [] {
+        std::array<QByteArray, 23> n;
+        for (int i = 0; i < 23; ++i)
+            n[static_cast<size_t>(i)] = ServiceName(i).toLatin1();
+        return n;
+    }();
+    if (code < 0 || code > 22)
+        return {};
+    return names[static_cast<size_t>(code)];
+}
+
+// Locks the grid view against repaint for one scope.
+class ViewLock final {
+public:
+    explicit ViewLock(GridView* view)
+        : m_view(view)
+    {
+        m_view->beginUpdate();
+    }
+    ~ViewLock() { m_view->endUpdate(); }
+    ViewLock(const ViewLock&) = delete;
+    ViewLock& operator=(const ViewLock&) = delete;
+
+private:
+    GridView* m_view;
+};
+
+struct SchemeColors {
+    QColor fp3;
+    QColor fp3Border;
+    QColor separator;
+    QColor separatorHighlight;
+    QColor searchFlat;
+    QColor search;
+    QColor frame;
+};
+
+SchemeColors schemeColors(int scheme)
+{
+    switch (normalizedColorScheme(scheme)) {
+    case 0:
+        return {QColor(0xC3DAF9), QColor(0x002C98), QColor(0x033893), QColor(0x5987D6), QColor(0x002C98),
+                QColor(0xC3DAF9), QColor(0x002D96)};
+    case 1:
+        return {QColor(0xF2F0E4), QColor(0x788C60), QColor(0x688048), QColor(0xB0C080), QColor(0x788C60),
+                QColor(0xF2F0E4), QColor(0x608058)};
+    default:
+        return {QColor(0xF3F3F7), QColor(0x787C90), QColor(0x757495), QColor(0xA5A4BD), QColor(0x787C90),
+                QColor(0xF3F3F7), QColor(0x807C98)};
+    }
+}
+
+void setBackground(QWidget* w, const QColor& color)
+{
+    QPalette pal = w->palette();
+    pal.setColor(QPalette::Window, color);
+    w->setPalette(pal);
+    w->setAutoFillBackground(true);
+}
+
+} // namespace
+
+// Field indexes of the bound store, resolved once per opening so the display rules, which run
+// for every row while sorting a million calls, never look a name up.
+struct LogFieldIndexes {
+    int lid = -1;
+    int cid = -1;
+    int abid = -1;
+    int ctype = -1;
+    int service = -1;
+    int fromphone = -1;
+    int frombez = -1;
+    int onmsn = -1;
+    int onbez = -1;
+};
+
+Tlogframe::Tlogframe(TDM2* dm, QWidget* parent)
+    : LogListFrame(parent)
+    , m_dm(dm ? dm : DM2())
+{
+    setObjectName(QStringLiteral("logframe"));
+    buildLayout();
+    buildColumns();
+    buildActions();
+    if (m_dm) {
+        m_source = std::make_unique<RecordStoreGridSource>(m_dm->ibcds_log.store());
+        // Whoever closes the log (the data module going down, another frame) must not leave the
+        // grid reading a store that is gone.
+        connect(&m_dm->ibcds_log, &DataSet::aboutToClose, this, [this] {
+            if (!m_refreshing)
+                detachSource();
+        });
+    }
+    connect(m_view, &GridView::focusedRecordChanged, this, &Tlogframe::TableViewFocusedRecordChanged);
+    connect(m_view, &GridView::rowDoubleClicked, this, [this](int) {
+        lf_bemerkungUpdate();
+        if (m_lfBemerkung->isEnabled())
+            m_lfBemerkung->trigger();
+    });
+    connect(m_view, &GridView::keyPressed, this, [this](int key, Qt::KeyboardModifiers) {
+        if (key != Qt::Key_Delete)
+            return;
+        lf_bemerkungUpdate();
+        if (m_lfDelitem->isEnabled())
+            m_lfDelitem->trigger();
+    });
+    connect(m_view, &GridView::rowContextMenuRequested, this, &Tlogframe::showPopup);
+    connect(m_view, &GridView::columnDraggedOut, this, &Tlogframe::cxGrid1DBTableView1ColumnPosChanged);
+    controller()->setTodayProvider([] { return Clock::today(); });
+    controller()->setKeyField(QStringLiteral("LID"));
+    lf_bemerkungUpdate();
+}
+
+Tlogframe::~Tlogframe()
+{
+    // The grid must not outlive the source it reads.
+    if (m_view)
+        m_view->setSource(nullptr);
+}
+
+GridController* Tlogframe::controller() const
+{
+    return m_view->controller();
+}
+
+QString Tlogframe::layoutFile(int viewMode)
+{
+    return programFile(viewMode == 1 ? QStringLiteral("VStoreLK") : QStringLiteral("VStoreL"));
+}
+
+// ---------------------------------------------------------------------------------------------
+// Construction
+
+void Tlogframe::buildLayout()
+{
+    auto* outer = new QVBoxLayout(this);
+    outer->setContentsMargins(0, 0, 0, 0);
+    m_fp3 = new QFrame(this);
+    m_fp3->setObjectName(QStringLiteral("FP3"));
+    m_fp3->setFrameShape(QFrame::Box);
+    outer->addWidget(m_fp3);
+    auto* box = new QVBoxLayout(m_fp3);
+    box->setContentsMargins(1, 1, 1, 1);
+    box->setSpacing(0);
+
+    m_separator = new QFrame(m_fp3);
+    m_separator->setObjectName(QStringLiteral("RzSeparator2"));
+    auto* sepLayout = new QHBoxLayout(m_separator);
+    sepLayout->setContentsMargins(6, 2, 6, 2);
+    m_cl1 = new TVKCutLabel(m_separator);
+    m_cl1->setObjectName(QStringLiteral("CL1"));
+    m_cl1->setAutoSize(false);
+    QFont f(QStringLiteral("Verdana"));
+    f.setBold(true);
+    f.setPointSize(10);
+    m_cl1->setFont(f);
+    QPalette lp = m_cl1->palette();
+    lp.setColor(QPalette::WindowText, Qt::white);
+    m_cl1->setPalette(lp);
+    m_cl1->setFixedHeight(QFontMetrics(f).height() + 4);
+    sepLayout->addWidget(m_cl1);
+    box->addWidget(m_separator);
+
+    // The search panel: built complete, kept collapsed and disabled.
+    m_searchPanel = new QFrame(m_fp3);
+    m_searchPanel->setObjectName(QStringLiteral("RzPanel1"));
+    auto* sp = new QHBoxLayout(m_searchPanel);
+    sp->setContentsMargins(4, 2, 4, 2);
+    auto* l1 = new QLabel(QStringLiteral("Suchen nach:"), m_searchPanel);
+    m_cxTE1 = new QLineEdit(m_searchPanel);
+    m_cxTE1->setObjectName(QStringLiteral("cxTE1"));
+    auto* l2 = new QLabel(QStringLiteral("Suchen in:"), m_searchPanel);
+    m_searchColumns = new QComboBox(m_searchPanel);
+    m_searchColumns->setObjectName(QStringLiteral("cxCheckComboBox1"));
+    m_searchColumns->addItems({QStringLiteral("Datum"), QStringLiteral("Zeit"), QStringLiteral("Anrufer"),
+                               QStringLiteral("An"), QStringLiteral("Status"), QStringLiteral("Bemerkung"),
+                               QStringLiteral("Region")});
+    const char* checkNames[3] = {"RzChB1", "RzChB2", "RzChB3"};
+    const QString checkTexts[3] = {QStringLiteral("aktuellen Filter auf Suchergebnis anwenden"),
+                                   QStringLiteral("genaue Suche"),
+                                   QStringLiteral("Groß-/Kleinschreibung berücksichtigen")};
+    m_l3 = new QLabel(QStringLiteral("» Suchmaske löschen «"), m_searchPanel);
+    m_l3->setObjectName(QStringLiteral("L3"));
+    m_searchStart = new QPushButton(QStringLiteral("Jetzt suchen"), m_searchPanel);
+    m_searchStart->setObjectName(QStringLiteral("ADVSearchStart"));
+    m_searchClose = new QPushButton(QStringLiteral("X"), m_searchPanel);
+    m_searchClose->setObjectName(QStringLiteral("AdvCloseSearchPan"));
+    m_searchClose->setToolTip(QStringLiteral("Suche schließen"));
+    sp->addWidget(l1);
+    sp->addWidget(m_cxTE1);
+    sp->addWidget(l2);
+    sp->addWidget(m_searchColumns);
+    for (int i = 0; i < 3; ++i) {
+        m_rzChB[i] = new QCheckBox(checkTexts[i], m_searchPanel);
+        m_rzChB[i]->setObjectName(QLatin1String(checkNames[i]));
+        sp->addWidget(m_rzChB[i]);
+    }
+    sp->addWidget(m_l3);
+    sp->addWidget(m_searchStart);
+    sp->addWidget(m_searchClose);
+    connect(m_searchClose, &QPushButton::clicked, this, [this] { postMessage(m_host, WMSEARCHUNCHECKED, 0, 0); });
+    box->addWidget(m_searchPanel);
+
+    m_cxGrid1 = new QWidget(m_fp3);
+    m_cxGrid1->setObjectName(QStringLiteral("cxGrid1"));
+    auto* gl = new QVBoxLayout(m_cxGrid1);
+    gl->setContentsMargins(0, 0, 0, 0);
+    m_view = new GridView(m_cxGrid1);
+    m_view->setObjectName(QStringLiteral("cxGrid1DBTableView1"));
+    m_view->setHeaderHeight(21);
+    m_view->setAutoWidth(true);
+    m_view->setGridLineColor(QColor(0xC0, 0xC0, 0xC0));
+    m_view->setImages(logimages::eaImages());
+    m_view->setCellPainter([this](QPainter& p, const GridCellInfo& cell) { return paintAbidCell(p, cell); });
+    gl->addWidget(m_view);
+    box->addWidget(m_cxGrid1, 1);
+}
+
+void Tlogframe::buildColumns()
+{
+    // The display rules read the field indexes of the bound store through this pointer.
+    auto fields = std::make_shared<LogFieldIndexes>();
+    m_fieldIndexes = fields;
+
+    const auto add = [this](const char* field, const QString& caption, int tag, int width, bool visible) {
+        GridColumn c;
+        c.name = columnName(field);
+        c.fieldName = QLatin1String(field);
+        c.caption = caption;
+        c.tag = tag;
+        if (width > 0)
+            c.width = width;
+        c.visible = visible;
+        return c;
+    };
+    const std::shared_ptr<const LogFieldIndexes> fx = fields;
+
+    GridColumn lid = add("LID", {}, 0, 0, false);
+    lid.sortable = lid.groupable = lid.movable = false;
+    lid.showInColumnMenu = false;
+    m_view->addColumn(lid);
+    m_view->addColumn(add("TSDATE", QStringLiteral("Datum"), 1, 70, true));
+    m_view->addColumn(add("TSTIME", QStringLiteral("Zeit"), 2, 51, true));
+    GridColumn ts = add("TS", {}, 0, 40, false);
+    ts.showInColumnMenu = false;
+    m_view->addColumn(ts);
+
+    GridColumn ctype = add("CTYPE", QStringLiteral("Verbindung"), 8, 80, true);
+    ctype.sortText = [fx](const GridSource& s, quint32 row) -> QByteArrayView {
+        if (fx->ctype < 0 || s.isNull(row, fx->ctype))
+            return kUnbekannt;
+        qint64 v = -1;
+        if (!static_cast<const RecordStoreGridSource&>(s).integerOf(row, fx->ctype, v))
+            return kUnbekannt;
+        return v == 0 ? kEingang : v == 1 ? kAusgang : kUnbekannt;
+    };
+    ctype.imageIndex = [fx](const GridSource& s, quint32 row) {
+        qint64 v = -1;
+        if (fx->ctype < 0 || !static_cast<const RecordStoreGridSource&>(s).integerOf(row, fx->ctype, v))
+            return -1;
+        return v == 0 ? 0 : v == 1 ? 1 : -1;
+    };
+    m_view->addColumn(ctype);
+
+    GridColumn service = add("SERVICE", QStringLiteral("ISDN-Service"), 6, 62, false);
+    service.sortText = [fx](const GridSource& s, quint32 row) -> QByteArrayView {
+        qint64 code = 0;
+        if (fx->service < 0 || !static_cast<const RecordStoreGridSource&>(s).integerOf(row, fx->service, code))
+            return kUnbekannt;
+        return serviceNameBytes(code);
+    };
+    m_view->addColumn(service);
+
+    GridColumn fromphone = add("FROMPHONE", QStringLiteral("Anrufernummer"), 0, 0, false);
+    fromphone.sortable = fromphone.groupable = fromphone.movable = false;
+    m_view->addColumn(fromphone);
+
+    // A name, else the number, else "Unbekannt": for the caller and the called party alike.
+    const auto nameOrNumber = [](int nameField, int numberField, const GridSource& s, quint32 row) -> QByteArrayView {
+        if (nameField >= 0) {
+            const QByteArrayView name = s.textValue(row, nameField);
+            if (!name.isEmpty())
+                return name;
+        }
+        if (numberField >= 0 && !s.isNull(row, numberField)) {
+            const QByteArrayView number = s.textValue(row, numberField);
+            if (!number.isEmpty())
+                return number;
+        }
+        return kUnbekannt;
+    };
+    GridColumn frombez = add("FROMBEZ", QStringLiteral("Anrufer"), 3, 153, true);
+    frombez.sortText = [fx, nameOrNumber](const GridSource& s, quint32 row) {
+        return nameOrNumber(fx->frombez, fx->fromphone, s, row);
+    };
+    m_view->addColumn(frombez);
+    m_view->addColumn(add("FROMSUBB", {}, 0, 0, false));
+    m_view->addColumn(add("ONMSN", QStringLiteral("Zielnummer"), 0, 0, false));
+    m_view->addColumn(add("REGION", QStringLiteral("Region"), 12, 153, true));
+    GridColumn onbez = add("ONBEZ", QStringLiteral("An"), 4, 58, true);
+    onbez.sortText = [fx, nameOrNumber](const GridSource& s, quint32 row) {
+        return nameOrNumber(fx->onbez, fx->onmsn, s, row);
+    };
+    m_view->addColumn(onbez);
+    m_view->addColumn(add("STATUS", QStringLiteral("Status"), 5, 78, true));
+    GridColumn cid = add("CID", {}, 0, 0, false);
+    cid.showInColumnMenu = false;
+    m_view->addColumn(cid);
+    GridColumn ctime = add("CTIME", QStringLiteral("Verbindungszeit"), 9, 0, true);
+    ctime.groupable = false;
+    m_view->addColumn(ctime);
+    GridColumn ccharge = add("CCHARGE", QStringLiteral("Kosten"), 10, 80, true);
+    ccharge.groupable = false;
+    ccharge.numberFormat = QStringLiteral("0.00 €");
+    ccharge.alignment = Qt::AlignRight | Qt::AlignVCenter;
+    m_view->addColumn(ccharge);
+    GridColumn bemerk = add("BEMERK", QStringLiteral("Bemerkung"), 7, 95, true);
+    bemerk.groupable = false;
+    m_view->addColumn(bemerk);
+    GridColumn abid = add("ABID", {}, 11, 30, true);
+    abid.groupable = false;
+    abid.showInColumnMenu = false;
+    m_abidColumn = m_view->addColumn(abid);
+}
+
+void Tlogframe::buildActions()
+{
+    const auto action = [this](const char* name, const QString& caption, QStyle::StandardPixmap icon) {
+        auto* a = new QAction(style()->standardIcon(icon), caption, this);
+        a->setObjectName(QLatin1String(name));
+        addAction(a);
+        return a;
+    };
+    m_lfBemerkung = action("lf_bemerkung", QStringLiteral("Bemerkung/Detailinformationen"),
+                           QStyle::SP_FileDialogDetailedView);
+    m_lfDelitem = action("lf_delitem", QStringLiteral("Protokolleintrag löschen"), QStyle::SP_TrashIcon);
+    m_lfAttachToContact = action("lf_attachtocontact", QStringLiteral("Eintrag als Kontakt anlegen"),
+                                 QStyle::SP_FileDialogNewFolder);
+    m_lfOpenContactFromLog = action("lf_opencontactfromlog", QStringLiteral("Zugehörigen Kontakt öffnen"),
+                                    QStyle::SP_DirOpenIcon);
+    m_lfPlayVoiceboxItem = action("lf_playvoiceboxitem", QStringLiteral("Anrufbeantwortereintrag abhören..."),
+                                  QStyle::SP_MediaPlay);
+    connect(m_lfBemerkung, &QAction::triggered, this, [this] { postMessage(m_host, WMLOGOPENBEMERKUNG, 0, 0); });
+    connect(m_lfDelitem, &QAction::triggered, this, [this] { postMessage(m_host, WMDELETELOGITEM, 0, 0); });
+
+    m_popup = new QMenu(this);
+    m_popup->setObjectName(QStringLiteral("AdvPopupMenu1"));
+    m_popup->addAction(m_lfBemerkung);
+    m_popup->addSeparator();
+    m_popup->addAction(m_lfPlayVoiceboxItem);
+    m_popup->addSeparator();
+    m_popup->addAction(m_lfAttachToContact);
+    m_popup->addAction(m_lfOpenContactFromLog);
+    m_popup->addSeparator();
+    m_popup->addAction(m_lfDelitem);
+    m_popup->addSeparator();
+    m_ansicht = m_popup->addMenu(QStringLiteral("Ansicht"));
+    m_ansicht->setObjectName(QStringLiteral("Ansicht1"));
+    struct Entry {
+        const char* name;
+        const char* caption;
+        int tag;
+    };
+    static constexpr Entry entries[] = {
+        {"Datum1", "Datum", 1},          {"Zeit1", "Zeit", 2},
+        {"Anrufer1", "Anrufer", 3},      {"Region1", "Region", 12},
+        {"An1", "An", 4},                {"Status1", "Status", 5},
+        {"ISDNService1", "ISDN-Service", 6}, {"Bemerkung1", "Bemerkung", 7},
+        {"Richtung1", "Verbindung", 8},  {"Verbindungszeit1", "Verbindungszeit", 9},
+        {"Kosten1", "Kosten", 10},       {"AnrufbeantworterNachricht1", "Anrufbeantworter-Nachricht", 11},
+    };
+    for (const Entry& e : entries) {
+        QAction* a = m_ansicht->addAction(QString::fromUtf8(e.caption));
+        a->setObjectName(QLatin1String(e.name));
+        a->setCheckable(true);
+        a->setProperty("tag", e.tag);
+        connect(a, &QAction::triggered, this, [this, a] { Datum1Click(a); });
+        m_columnEntries.append(a);
+    }
+}
+
+// ---------------------------------------------------------------------------------------------
+// Source binding
+
+bool Tlogframe::connected() const
+{
+    return m_dm && m_dm->IBDatabase1.isConnected();
+}
+
+void Tlogframe::bindSource()
+{
+    if (!m_dm || !m_source || !m_dm->ibcds_log.isActive()) {
+        detachSource();
+        return;
+    }
+    const RecordStore& store = m_dm->ibcds_log.store();
+    LogFieldIndexes& fx = *m_fieldIndexes;
+    fx.lid = store.fieldIndex(u"LID");
+    fx.cid = store.fieldIndex(u"CID");
+    fx.abid = store.fieldIndex(u"ABID");
+    fx.ctype = store.fieldIndex(u"CTYPE");
+    fx.service = store.fieldIndex(u"SERVICE");
+    fx.fromphone = store.fieldIndex(u"FROMPHONE");
+    fx.frombez = store.fieldIndex(u"FROMBEZ");
+    fx.onmsn = store.fieldIndex(u"ONMSN");
+    fx.onbez = store.fieldIndex(u"ONBEZ");
+    m_view->setSource(m_source.get());
+}
+
+void Tlogframe::detachSource()
+{
+    if (controller()->source())
+        m_view->setSource(nullptr);
+    *m_fieldIndexes = LogFieldIndexes();
+}
+
+// ---------------------------------------------------------------------------------------------
+// Opening
+
+bool Tlogframe::Firstep(QObject* host)
+{
+    ApplyColorScheme();
+    m_filterName.clear();
+    m_host = host;
+    clearFocusedRecord();
+    ResetSearchPanel();
+    m_noLog = false;
+
+    if (m_viewMode == 0) {
+        BusyCursor busy;
+        ViewLock lock(m_view);
+        try {
+            if (!m_dm)
+                throw AppException(QStringLiteral("Kein Datenmodul vorhanden."));
+            DataSet& log = m_dm->ibcds_log;
+            log.close();
+            log.setCommandText(QStringLiteral("SELECT * FROM LOG"));
+            log.open();
+            bindSource();
+            if (log.isActive())
+                GridLayoutStore::restoreFromFile(*controller(), layoutFile(0), kView);
+            EnsureSorting();
+        } catch (const std::exception& e) {
+            if (m_dm)
+                m_dm->logts.rollbackQuietly();
+            detachSource();
+            BusyCursor::resetCursor();
+            reportError(kLabel + QStringLiteral("Firstep"), &e);
+        }
+    } else if (m_viewMode == 1) {
+        if (OpenDBonDay(m_logDay) && m_dm && m_dm->ibcds_log.isActive()) {
+            try {
+                ViewLock lock(m_view);
+                GridLayoutStore::restoreFromFile(*controller(), layoutFile(1), kView);
+            } catch (const std::exception& e) {
+                reportError(kLabel + QStringLiteral("Firstep"), &e);
+            }
+        }
+        EnsureSorting();
+    }
+
+    // After the restore, so that no stored layout can show them.
+    m_lfPlayVoiceboxItem->setVisible(false);
+    m_lfAttachToContact->setVisible(false);
+    m_lfOpenContactFromLog->setVisible(false);
+    {
+        ViewLock lock(m_view);
+        for (const char* field : {"ABID", "CCHARGE", "CTIME"})
+            controller()->setColumnVisible(controller()->columnByName(columnName(field)), false);
+    }
+    for (const char* entry : {"AnrufbeantworterNachricht1", "Kosten1", "Verbindungszeit1"}) {
+        if (QAction* a = m_ansicht->findChild<QAction*>(QLatin1String(entry)))
+            a->setVisible(false);
+    }
+    for (QAction* a : m_columnEntries) {
+        if (!a->isVisible())
+            a->setChecked(false);
+    }
+    UpdateLogCaption();
+    PostLogStatus();
+    SetTableViewPopup();
+    lf_bemerkungUpdate();
+    return true;
+}
+
+bool Tlogframe::OpenDBonDay(QDate day)
+{
+    bool ok = true;
+    {
+        ViewLock lock(m_view);
+        BusyCursor busy;
+        m_logDay = day;
+        try {
+            if (!m_dm)
+                throw AppException(QStringLiteral("Kein Datenmodul vorhanden."));
+            DataSet& log = m_dm->ibcds_log;
+            log.close();
+            log.setCommandText(QStringLiteral("SELECT * FROM LOG WHERE TSDATE = :TSD"));
+            log.setParam(QStringLiteral("TSD"), day.isValid() ? QVariant(day) : QVariant(QMetaType(QMetaType::QDate)));
+            log.open();
+            bindSource();
+            if (log.isActive())
+                log.first();
+            UpdateLogCaption();
+            EnsureSorting();
+        } catch (const std::exception& e) {
+            ok = false;
+            if (m_dm)
+                m_dm->logts.rollbackQuietly();
+            detachSource();
+            BusyCursor::resetCursor();
+            reportError(kLabel + QStringLiteral("OpenDBonDay"), &e);
+        }
+    }
+    PostLogStatus();
+    lf_bemerkungUpdate();
+    return ok;
+}
+
+// ---------------------------------------------------------------------------------------------
+// Sorting and grouping
+
+void Tlogframe::EnsureSorting()
+{
+    ViewLock lock(m_view);
+    if (controller()->sortedColumns().empty())
+        CheckSorting();
+}
+
+void Tlogframe::CheckSorting()
+{
+    try {
+        ViewLock lock(m_view);
+        GridController* g = controller();
+        for (const int c : g->columnOrder()) {
+            const QString& field = g->column(c).fieldName;
+            if (field == QLatin1String("TSDATE") || field == QLatin1String("TSTIME"))
+                g->setSortOrder(c, GridSortOrder::Descending);
+        }
+    } catch (const std::exception& e) {
+        reportError(kLabel + QStringLiteral("CheckSorting"), &e);
+    }
+}
+
+void Tlogframe::SetDateSort()
+{
+    try {
+        CheckSorting();
+    } catch (const std::exception& e) {
+        reportError(kLabel + QStringLiteral("SetDateSort"), &e);
+    }
+}
+
+bool Tlogframe::NoGroup()
+{
+    try {
+        ViewLock lock(m_view);
+        GridController* g = controller();
+        g->setGroupByBoxVisible(false);
+        g->clearGrouping();
+        g->clearSorting();
+        SetDateSort();
+    } catch (const std::exception& e) {
+        reportError(kLabel + QStringLiteral("NoGroup"), &e);
+    }
+    return true;
+}
+
+void Tlogframe::ColuGroup(const QString& caption)
+{
+    try {
+        const int c = controller()->columnByCaption(caption);
+        if (c < 0)
+            return;
+        controller()->groupBy(c, 0);
+        controller()->setColumnVisible(c, false);
+    } catch (const std::exception& e) {
+        reportError(kLabel + QStringLiteral("ColuGroup"), &e);
+    }
+}
+
+void Tlogframe::ToGroup(int kind)
+{
+    try {
+        BusyCursor busy;
+        {
+            ViewLock lock(m_view);
+            NoGroup();
+            switch (kind) {
+            case 1:
+                ColuGroup(QStringLiteral("Datum"));
+                break;
+            case 2:
+                ColuGroup(QStringLiteral("Anrufer"));
+                break;
+            case 3:
+                ColuGroup(QStringLiteral("An"));
+                break;
+            case 4:
+                controller()->setGroupByBoxVisible(true);
+                break;
+            case 5:
+                ColuGroup(QStringLiteral("Verbindung"));
+                break;
+            default:
+                break;
+            }
+        }
+        FocusLastRecord();
+    } catch (const std::exception& e) {
+        BusyCursor::resetCursor();
+        reportError(kLabel + QStringLiteral("ToGroup"), &e);
+    }
+}
+
+void Tlogframe::FocusLastRecord()
+{
+    BusyCursor busy;
+    ViewLock lock(m_view);
+    GridController* g = controller();
+    if (!g->isGrouped() || !g->source() || g->source()->rowCount() == 0)
+        return;
+    g->expandAll(false);
+    // The data set's last record, the newest call: its groups open, its row focused.
+    g->focusRecord(g->source()->rowCount() - 1);
+}
+
+bool Tlogframe::CanExpandGroups() const
+{
+    return controller()->isActive() && controller()->isGrouped();
+}
+
+void Tlogframe::ExpandAllGroups(bool expand)
+{
+    if (!controller()->isActive())
+        return;
+    ViewLock lock(m_view);
+    controller()->expandAll(expand);
+}
+
+// ---------------------------------------------------------------------------------------------
+// Filter
+
+void Tlogframe::ClearFilterItems()
+{
+    controller()->clearFilterItems();
+}
+
+void Tlogframe::SetNewFilter(int kind)
+{
+    BusyCursor busy;
+    try {
+        GridController* g = controller();
+        if (kind >= 1 && kind <= 3) {
+            static const GridFilterOperator ops[3] = {GridFilterOperator::Today, GridFilterOperator::ThisWeek,
+                                                      GridFilterOperator::ThisMonth};
+            static const char* texts[3] = {"Heute", "diese Woche", "dieser Monat"};
+            const GridFilterOperator op = ops[kind - 1];
+            const QString name = gridFilterOperatorName(op);
+            if (m_filterName != name) {
+                m_filterName = name;
+                ViewLock lock(m_view);
+                g->setFilterActive(false);
+                ClearFilterItems();
+                g->addFilterItem(GridFilterItem::list(
+                    GridFilterBoolOperator::And,
+                    {GridFilterItem::condition(columnName("TSDATE"), op, {}, QString::fromUtf8(texts[kind - 1]))}));
+                g->setTag(kind);
+                g->setFilterActive(true);
+            }
+        } else if (kind != 0 || !m_filterName.isEmpty() || g->tag() != 0) {
+            ViewLock lock(m_view);
+            g->setFilterActive(false);
+            ClearFilterItems();
+            g->setTag(0);
+            if (!g->filter().isEmpty())
+                g->setFilterActive(true);
+            m_filterName.clear();
+        }
+    } catch (const std::exception& e) {
+        try {
+            ClearFilterItems();
+        } catch (...) {
+        }
+        m_filterName.clear();
+        BusyCursor::resetCursor();
+        reportError(kLabel + QStringLiteral("SetNewFilter\r\nOperation kann nicht ausgeführt werden!"), &e);
+    }
+    BusyCursor::resetCursor();
+    PostLogStatus();
+    UpdateLogCaption();
+}
+
+void Tlogframe::WhatsOn(int& filterKind, int& groupKind)
+{
+    try {
+        m_filterName.clear();
+        UpdateLogCaption();
+        filterKind = 0;
+        groupKind = 0;
+        const GridController* g = controller();
+        if (g->filter().active && !g->filter().isEmpty()) {
+            const QString text = g->filterText();
+            const GridFilterOperator ops[3] = {GridFilterOperator::Today, GridFilterOperator::ThisWeek,
+                                               GridFilterOperator::ThisMonth};
+            for (int i = 0; i < 3; ++i) {
+                const QString name = gridFilterOperatorName(ops[i]);
+                if (text.contains(name)) {
+                    filterKind = i + 1;
+                    m_filterName = name;
+                }
+            }
+            UpdateLogCaption();
+        }
+        if (g->isGroupByBoxVisible()) {
+            groupKind = 4;
+            return;
+        }
+        for (const int c : g->columnOrder()) {
+            if (g->groupIndex(c) < 0)
+                continue;
+            const QString& caption = g->column(c).caption;
+            if (caption == QLatin1String("Datum"))
+                groupKind = 1;
+            else if (caption == QLatin1String("Anrufer"))
+                groupKind = 2;
+            else if (caption == QLatin1String("An"))
+                groupKind = 3;
+            else if (caption == QLatin1String("Verbindung"))
+                groupKind = 5;
+            break;
+        }
+    } catch (const std::exception& e) {
+        reportError(kLabel + QStringLiteral("WhatsOn"), &e);
+    }
+}
+
+// ---------------------------------------------------------------------------------------------
+// Caption, status, refresh, layout
+
+void Tlogframe::setCaptionText(const QString& text)
+{
+    m_cl1->setText(text);
+}
+
+QString Tlogframe::captionText() const
+{
+    return m_cl1->text();
+}
+
+void Tlogframe::UpdateLogCaption()
+{
+    QString text;
+    if (m_viewMode == 1) {
+        text = m_noLog ? QStringLiteral("Kein Protokoll vorhanden.")
+                       : QStringLiteral("Anrufprotokoll vom ") + m_logDay.toString(QStringLiteral("dd.MM.yyyy"));
+    } else if (m_viewMode == 0) {
+        if (m_filterName.isEmpty())
+            text = QStringLiteral("Anrufprotokoll (alle)");
+        else if (m_filterName == gridFilterOperatorName(GridFilterOperator::Today))
+            text = QStringLiteral("Anrufprotokoll (gefiltert nach \"Heute\")");
+        else if (m_filterName == gridFilterOperatorName(GridFilterOperator::ThisWeek))
+            text = QStringLiteral("Anrufprotokoll (gefiltert nach \"diese Woche\")");
+        else if (m_filterName == gridFilterOperatorName(GridFilterOperator::ThisMonth))
+            text = QStringLiteral("Anrufprotokoll (gefiltert nach \"dieser Monat\")");
+        else
+            text = QStringLiteral("Anrufprotokoll (Filter unbekannt)");
+    }
+    m_cl1->setText(text);
+}
+
+void Tlogframe::PostLogStatus()
+{
+    const int rows = controller()->rowCount();
+    postMessage(m_host, WMSTATUSPANEL, rows < 1 ? 0 : rows, 0);
+}
+
+void Tlogframe::Refresh_View(int lid)
+{
+    try {
+        if (m_dm && m_dm->ibcds_log.isActive()) {
+            BusyCursor busy;
+            ViewLock lock(m_view);
+            m_refreshing = true;
+            try {
+                m_dm->ibcds_log.refresh();
+            } catch (...) {
+                m_refreshing = false;
+                detachSource();
+                throw;
+            }
+            m_refreshing = false;
+            controller()->sourceChanged();
+            if (lid > 0) {
+                const int record = controller()->locate(lid);
+                if (record >= 0)
+                    controller()->focusRecord(static_cast<quint32>(record));
+            }
+            m_view->setFocus();
+        }
+    } catch (const std::exception& e) {
+        BusyCursor::resetCursor();
+        logError(kLabel + QStringLiteral("Refresh_View"), &e);
+    }
+    PostLogStatus();
+    lf_bemerkungUpdate();
+}
+
+bool Tlogframe::StoreLogView()
+{
+    try {
+        if (m_dm && m_dm->ibcds_log.isActive()) {
+            if (!GridLayoutStore::storeToFile(*controller(), layoutFile(m_viewMode), kView))
+                logError(kLabel + QStringLiteral("StoreLogView\r\nDie Ansicht konnte nicht gespeichert werden."));
+        }
+        if (m_dm)
+            m_dm->ibcds_log.close();
+    } catch (const std::exception& e) {
+        logError(kLabel + QStringLiteral("StoreLogView"), &e);
+    }
+    detachSource();
+    QCoreApplication::processEvents();
+    return true;
+}
+
+int Tlogframe::CurrentLogLID() const
+{
+    return m_dm ? m_dm->CurLogLID : -1;
+}
+
+// ---------------------------------------------------------------------------------------------
+// Search panel and colours
+
+void Tlogframe::ResetSearchPanel()
+{
+    m_searchPanel->setFixedHeight(1);
+    m_searchColumns->setCurrentIndex(-1);
+    m_searchColumns->setEnabled(false);
+    for (QCheckBox* box : m_rzChB) {
+        box->setChecked(false);
+        box->setEnabled(false);
+    }
+    m_l3->hide();
+    m_cxTE1->clear();
+    m_cxTE1->setEnabled(false);
+    m_searchStart->setEnabled(false);
+}
+
+void Tlogframe::ApplyColorScheme()
+{
+    const SchemeColors c = schemeColors(appColorScheme());
+    setBackground(m_fp3, c.fp3);
+    QPalette fp = m_fp3->palette();
+    fp.setColor(QPalette::WindowText, c.fp3Border);
+    fp.setColor(QPalette::Light, c.fp3Border);
+    fp.setColor(QPalette::Dark, c.fp3Border);
+    m_fp3->setPalette(fp);
+    setBackground(m_separator, c.separator);
+    QPalette sp = m_separator->palette();
+    sp.setColor(QPalette::Light, c.separatorHighlight);
+    m_separator->setPalette(sp);
+    setBackground(m_searchPanel, c.search);
+    m_view->setGroupRowColor(c.fp3);
+    m_view->setGridLineColor(QColor(0xC0, 0xC0, 0xC0));
+}
+
+// ---------------------------------------------------------------------------------------------
+// Column menu
+
+QAction* Tlogframe::menuEntryByTag(int tag) const
+{
+    for (QAction* a : m_columnEntries) {
+        if (a->property("tag").toInt() == tag)
+            return a;
+    }
+    return nullptr;
+}
+
+void Tlogframe::Datum1Click(QAction* entry)
+{
+    // The check mark has already toggled.
+    SetTableColVisibleState(entry->isChecked(), entry->property("tag").toInt());
+}
+
+void Tlogframe::SetTableColVisibleState(bool visible, int tag)
+{
+    try {
+        ViewLock lock(m_view);
+        const int c = controller()->columnByTag(tag);
+        if (c >= 0)
+            controller()->setColumnVisible(c, visible);
+    } catch (const std::exception& e) {
+        reportError(kLabel + QStringLiteral("SetTableColVisibleState"), &e);
+    }
+}
+
+void Tlogframe::SetTableViewPopup()
+{
+    try {
+        ViewLock lock(m_view);
+        const QSignalBlocker block(m_ansicht);
+        for (const int c : controller()->visibleColumns()) {
+            const int tag = controller()->column(c).tag;
+            if (tag == 0)
+                continue;
+            if (QAction* a = menuEntryByTag(tag))
+                a->setChecked(true);
+        }
+    } catch (const std::exception& e) {
+        reportError(kLabel + QStringLiteral("Firststep - SetTableViewPopup"), &e);
+    }
+}
+
+void Tlogframe::cxGrid1DBTableView1ColumnPosChanged(int column)
+{
+    if (column < 0 || column >= controller()->columnCount() || controller()->isColumnVisible(column))
+        return;
+    const int tag = controller()->column(column).tag;
+    if (tag == 0)
+        return;
+    if (QAction* a = menuEntryByTag(tag))
+        a->setChecked(false);
+}
+
+void Tlogframe::showPopup(const QPoint& globalPos)
+{
+    lf_bemerkungUpdate();
+    m_popup->popup(globalPos);
+}
+
+// ---------------------------------------------------------------------------------------------
+// Focused record and actions
+
+void Tlogframe::clearFocusedRecord()
+{
+    if (!m_dm)
+        return;
+    m_dm->CurLogLID = -1;
+    m_dm->CurLogCID = -1;
+    m_dm->CurLogABID = -1;
+    m_dm->CurLogCType = -1;
+    m_dm->CurLogFromPhone.clear();
+}
+
+void Tlogframe::TableViewFocusedRecordChanged()
+{
+    try {
+        const int record = controller()->focusedRecord();
+        if (!m_dm || record < 0 || !controller()->source()) {
+            clearFocusedRecord();
+        } else {
+            const auto row = static_cast<quint32>(record);
+            const LogFieldIndexes& fx = *m_fieldIndexes;
+            const auto number = [&](int field) {
+                qint64 v = -1;
+                if (!m_source->integerOf(row, field, v) || v < INT_MIN || v > INT_MAX)
+                    return -1;
+                return static_cast<int>(v);
+            };
+            m_dm->CurLogLID = number(fx.lid);
+            m_dm->CurLogCID = number(fx.cid);
+            m_dm->CurLogABID = number(fx.abid);
+            m_dm->CurLogCType = number(fx.ctype);
+            m_dm->CurLogFromPhone = fx.fromphone >= 0 ? m_source->text(row, fx.fromphone) : QString();
+        }
+    } catch (const std::exception& e) {
+        clearFocusedRecord();
+        logError(kLabel + QStringLiteral("TableViewFocusedRecordChanged"), &e);
+    }
+    lf_bemerkungUpdate();
+}
+
+void Tlogframe::lf_bemerkungUpdate()
+{
+    const bool enabled = connected() && m_dm->CurLogLID != -1;
+    if (m_lfBemerkung->isEnabled() != enabled)
+        m_lfBemerkung->setEnabled(enabled);
+    if (m_lfDelitem->isEnabled() != enabled)
+        m_lfDelitem->setEnabled(enabled);
+}
+
+bool Tlogframe::paintAbidCell(QPainter& painter, const GridCellInfo& cell) const
+{
+    if (cell.column != m_abidColumn)
+        return false;
+    try {
+        painter.fillRect(cell.rect, cell.background);
+        qint64 abid = 0;
+        const LogFieldIndexes& fx = *m_fieldIndexes;
+        if (cell.record >= 0 && controller()->source()
+            && m_source->integerOf(static_cast<quint32>(cell.record), fx.abid, abid) && abid > 0) {
+            const QPixmap& pm = m_view->images().at(logimages::AnsweringMachine);
+            painter.drawPixmap(cell.rect.left() + (cell.rect.width() - 16) / 2,
+                               cell.rect.top() + (cell.rect.height() - 16) / 2, pm);
+        }
+    } catch (const std::exception& e) {
+        logError(QStringLiteral("# LogFrame - ABIDCustomDrawCell"), &e);
+    }
+    return true;
+}
+
+} // namespace orvanta

@@ -1,0 +1,141 @@
+#pragma once
+// The call-log list: the rows of LOG through the data module's ibcds_log in a read-only grid,
+// the whole log or one day, with one period filter at a time, a choice of grouping, a column
+// menu, and a layout file per view ("VStoreL", "VStoreLK" in the program folder). It writes
+// nothing to the database: deleting and opening remarks are asked of the host by posted
+// messages, and the focused record is published in the data module's CurLog* fields.
+
+#include "ui/frames/LogListFrame.h"
+
+#include <QColor>
+#include <QPointer>
+#include <memory>
+
+class QAction;
+class QCheckBox;
+class QComboBox;
+class QFrame;
+class QLabel;
+class QLineEdit;
+class QMenu;
+class QPushButton;
+
+namespace orvanta {
+
+class GridController;
+struct GridCellInfo;
+struct LogFieldIndexes;
+class GridView;
+class RecordStoreGridSource;
+class TDM2;
+class TVKCutLabel;
+
+class Tlogframe final : public LogListFrame {
+    Q_OBJECT
+    Q_DISABLE_COPY_MOVE(Tlogframe)
+
+public:
+    // dm: the data module to read from (nullptr: the shared one).
+    explicit Tlogframe(TDM2* dm = nullptr, QWidget* parent = nullptr);
+    ~Tlogframe() override;
+
+    // --- what the host calls --------------------------------------------------------------
+    void setViewMode(int mode) override { m_viewMode = mode; }
+    [[nodiscard]] int viewMode() const override { return m_viewMode; }
+    void setLogDay(QDate day) override { m_logDay = day; }
+    [[nodiscard]] QDate logDay() const override { return m_logDay; }
+    void setNoLog(bool noLog) override { m_noLog = noLog; }
+    void setCaptionText(const QString& text) override;
+    [[nodiscard]] QString captionText() const override;
+    [[nodiscard]] bool isBusy() const override { return m_busy; }
+    void setBusy(bool busy) override { m_busy = busy; }
+
+    bool Firstep(QObject* host) override;
+    bool OpenDBonDay(QDate day) override;
+    void SetNewFilter(int kind) override;
+    void ToGroup(int kind) override;
+    void WhatsOn(int& filterKind, int& groupKind) override;
+    void SetTableViewPopup() override;
+    void Refresh_View(int lid) override;
+    bool StoreLogView() override;
+    [[nodiscard]] bool CanExpandGroups() const override;
+    void ExpandAllGroups(bool expand) override;
+    [[nodiscard]] int CurrentLogLID() const override;
+
+    // --- the frame's own steps --------------------------------------------------------------
+    void EnsureSorting();
+    void CheckSorting();
+    void SetDateSort();
+    bool NoGroup();
+    void ColuGroup(const QString& caption);
+    void FocusLastRecord();
+    void ClearFilterItems();
+    void UpdateLogCaption();
+    void PostLogStatus();
+    void ResetSearchPanel();
+    void ApplyColorScheme();
+    void SetTableColVisibleState(bool visible, int tag);
+
+    // The operator name of the active period filter ("is this week"), empty for none.
+    [[nodiscard]] const QString& filterName() const { return m_filterName; }
+    [[nodiscard]] GridView* view() const { return m_view; }
+    [[nodiscard]] GridController* controller() const;
+    [[nodiscard]] QMenu* popupMenu() const { return m_popup; }
+    // "VStoreL" (whole log) or "VStoreLK" (one day) in the program folder.
+    [[nodiscard]] static QString layoutFile(int viewMode);
+
+    // The enable rule of lf_bemerkung and lf_delitem, run whenever what it depends on changes.
+    void lf_bemerkungUpdate();
+
+private:
+    void buildColumns();
+    void buildActions();
+    void buildLayout();
+    void bindSource();
+    void detachSource();
+    void TableViewFocusedRecordChanged();
+    void Datum1Click(QAction* entry);
+    void cxGrid1DBTableView1ColumnPosChanged(int column);
+    void showPopup(const QPoint& globalPos);
+    [[nodiscard]] bool paintAbidCell(QPainter& painter, const GridCellInfo& cell) const;
+    [[nodiscard]] QAction* menuEntryByTag(int tag) const;
+    void clearFocusedRecord();
+    [[nodiscard]] bool connected() const;
+
+    TDM2* m_dm;
+    std::unique_ptr<RecordStoreGridSource> m_source;
+    std::shared_ptr<LogFieldIndexes> m_fieldIndexes;
+    QPointer<QObject> m_host;
+
+    int m_viewMode = 0;         // FViewMode
+    QDate m_logDay;             // FLogDay
+    bool m_noLog = false;       // FNoLog
+    QString m_filterName;       // FFilterName
+    bool m_busy = false;
+    bool m_refreshing = false;
+    int m_abidColumn = -1;
+
+    QFrame* m_fp3 = nullptr;
+    QFrame* m_separator = nullptr; // RzSeparator2
+    TVKCutLabel* m_cl1 = nullptr;
+    QFrame* m_searchPanel = nullptr; // RzPanel1
+    QLineEdit* m_cxTE1 = nullptr;
+    QComboBox* m_searchColumns = nullptr; // cxCheckComboBox1
+    QCheckBox* m_rzChB[3] = {};
+    QLabel* m_l3 = nullptr;
+    QPushButton* m_searchStart = nullptr;
+    QPushButton* m_searchClose = nullptr;
+    QWidget* m_cxGrid1 = nullptr;
+    GridView* m_view = nullptr;
+
+    QAction* m_lfBemerkung = nullptr;
+    QAction* m_lfDelitem = nullptr;
+    QAction* m_lfAttachToContact = nullptr;
+    QAction* m_lfOpenContactFromLog = nullptr;
+    QAction* m_lfPlayVoiceboxItem = nullptr;
+    QMenu* m_popup = nullptr;  // AdvPopupMenu1
+    QMenu* m_ansicht = nullptr;
+    QList<QAction*> m_columnEntries;
+};
+
+} // namespace orvanta
