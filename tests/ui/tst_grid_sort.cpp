@@ -3,6 +3,7 @@
 #include "ui/grid/GridController.h"
 #include "ui/grid/MemoryGridSource.h"
 
+#include <QRandomGenerator>
 #include <QSignalSpy>
 #include <QTest>
 
@@ -81,6 +82,30 @@ private Q_SLOTS:
         QVERIFY(gridcollation::compare("Apfel", "\xc4pfel") < 0);
         QVERIFY(gridcollation::compare("", "a") < 0);
         QVERIFY(gridcollation::compare("a", "") > 0);
+    }
+
+    void sortKeysOrderLikeCompare()
+    {
+        // Short texts over an alphabet full of ties: case, accents, expansions, ignored marks.
+        const QByteArray alphabet("aAbB-' \xe4\xc4\xdfsSeE\xe9\xe6" "0z\x00", 19);
+        QRandomGenerator rng(1);
+        std::vector<QByteArray> texts;
+        for (int i = 0; i < 400; ++i) {
+            QByteArray t;
+            for (int n = int(rng.bounded(5)); n > 0; --n)
+                t.append(alphabet[int(rng.bounded(quint32(alphabet.size())))]);
+            texts.push_back(t);
+        }
+        for (const QByteArray& a : texts) {
+            for (const QByteArray& b : texts) {
+                const int c = gridcollation::compare(a, b);
+                const QByteArray ka = gridcollation::sortKey(a);
+                const QByteArray kb = gridcollation::sortKey(b);
+                const int k = std::string_view(ka.constData(), size_t(ka.size())).compare(std::string_view(kb.constData(), size_t(kb.size())));
+                if ((c < 0) != (k < 0) || (c == 0) != (k == 0))
+                    QFAIL(qPrintable(QStringLiteral("%1 vs %2: compare %3, key %4").arg(QString::fromLatin1(a.toHex()), QString::fromLatin1(b.toHex())).arg(c).arg(k)));
+            }
+        }
     }
 
     void likeMatchesWildcards()

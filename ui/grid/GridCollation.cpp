@@ -159,6 +159,38 @@ int compare(QByteArrayView a, QByteArrayView b)
     return a.size() == b.size() ? 0 : (a.size() < b.size() ? -1 : 1);
 }
 
+void appendSortKey(QByteArrayView text, QByteArray& out)
+{
+    const auto& t = table().w;
+    // Primary weights as two big-endian bytes each (all >= 0x0100), ended by two zero bytes.
+    for (const char ch : text) {
+        const Weight& w = t[static_cast<unsigned char>(ch)];
+        if (w.w1 == 0)
+            continue;
+        out.append(static_cast<char>(w.w1 >> 8)).append(static_cast<char>(w.w1 & 0xFF));
+        if (w.w2 != 0)
+            out.append(static_cast<char>(w.w2 >> 8)).append(static_cast<char>(w.w2 & 0xFF));
+    }
+    out.append('\0').append('\0');
+    // Accents of the characters that count, plus one so that the end marker sorts first.
+    for (const char ch : text) {
+        const Weight& w = t[static_cast<unsigned char>(ch)];
+        if (w.w1 != 0)
+            out.append(static_cast<char>(w.accent + 1));
+    }
+    out.append('\0');
+    for (const char ch : text)
+        out.append(static_cast<char>(foldCase(static_cast<unsigned char>(ch))));
+}
+
+QByteArray sortKey(QByteArrayView text)
+{
+    QByteArray key;
+    key.reserve(text.size() * 4 + 3);
+    appendSortKey(text, key);
+    return key;
+}
+
 bool like(QByteArrayView text, QByteArrayView pattern, bool caseSensitive)
 {
     // Iterative wildcard match with one backtrack point: linear for the patterns grids use.

@@ -13,6 +13,12 @@ namespace orvanta::gridcollation {
 [[nodiscard]] int compare(QByteArrayView a, QByteArrayView b);
 [[nodiscard]] inline bool less(QByteArrayView a, QByteArrayView b) { return compare(a, b) < 0; }
 
+// A byte string whose plain byte order (memcmp, shorter first) is the order of compare():
+// equal keys exactly when compare() gives 0. Sorting many texts by key is much faster than
+// sorting them with compare().
+[[nodiscard]] QByteArray sortKey(QByteArrayView text);
+void appendSortKey(QByteArrayView text, QByteArray& out);
+
 // Latin-1 lower case of one byte.
 [[nodiscard]] unsigned char foldCase(unsigned char c);
 

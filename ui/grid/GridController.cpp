@@ -1,5 +1,6 @@
 #include "ui/grid/GridController.h"
 
+#include "platform/Clock.h"
 #include "ui/grid/GridCollation.h"
 #include "ui/grid/GridFormat.h"
 
@@ -7,6 +8,7 @@
 #include <algorithm>
 #include <bit>
 #include <numeric>
+#include <string_view>
 
 namespace orvanta {
 namespace {
@@ -48,9 +50,17 @@ public:
             cap <<= 1;
         m_slots.assign(cap, 0);
     }
+    static size_t hashOf(QByteArrayView text)
+    {
+        // FNV-1a: the texts are short, and a cheap hash is what matters at a million rows.
+        quint64 h = 14695981039346656037ull;
+        for (const char c : text)
+            h = (h ^ static_cast<unsigned char>(c)) * 1099511628211ull;
+        return static_cast<size_t>(h ^ (h >> 29));
+    }
     quint32 intern(QByteArrayView text)
     {
-        const size_t h = qHash(text);
+        const size_t h = hashOf(text);
         size_t mask = m_slots.size() - 1;
         size_t i = h & mask;
         for (;;) {
@@ -105,7 +115,7 @@ struct CompiledFilter {
 
 GridController::GridController(QObject* parent)
     : QObject(parent)
-    , m_today([] { return QDate::currentDate(); })
+    , m_today([] { return Clock::today(); })
 {
 }
 
@@ -516,7 +526,7 @@ void GridController::clearFilterItems()
 
 void GridController::setTodayProvider(std::function<QDate()> today)
 {
-    m_today = today ? std::move(today) : std::function<QDate()>([] { return QDate::currentDate(); });
+    m_today = today ? std::move(today) : std::function<QDate()>([] { return Clock::today(); });
     invalidate(DirtyFilter);
 }
 
@@ -835,15 +845,25 @@ void GridController::computeTextRanks(int c, Ranks& out) const
     TextInterner interner(n);
     for (quint32 row = 0; row < n; ++row)
         out.rank[row] = interner.intern(keyText(c, row));
+    // Collation keys of the distinct texts in one buffer, then a byte-wise sort of them.
     const std::vector<QByteArrayView>& texts = interner.texts();
+    QByteArray keys;
+    std::vector<quint32> keyStart(texts.size() + 1);
+    for (size_t i = 0; i < texts.size(); ++i) {
+        keyStart[i] = static_cast<quint32>(keys.size());
+        gridcollation::appendSortKey(texts[i], keys);
+    }
+    keyStart[texts.size()] = static_cast<quint32>(keys.size());
+    const auto key = [&](quint32 id) {
+        return std::string_view(keys.constData() + keyStart[id], keyStart[id + 1] - keyStart[id]);
+    };
     std::vector<quint32> byText(texts.size());
     std::iota(byText.begin(), byText.end(), 0u);
-    std::sort(byText.begin(), byText.end(),
-              [&](quint32 a, quint32 b) { return gridcollation::less(texts[a], texts[b]); });
+    std::sort(byText.begin(), byText.end(), [&](quint32 a, quint32 b) { return key(a) < key(b); });
     std::vector<quint32> rankOfId(texts.size());
     quint32 rank = 0;
     for (size_t i = 0; i < byText.size(); ++i) {
-        if (i > 0 && gridcollation::compare(texts[byText[i - 1]], texts[byText[i]]) != 0)
+        if (i > 0 && key(byText[i - 1]) != key(byText[i]))
             ++rank;
         rankOfId[byText[i]] = rank;
     }

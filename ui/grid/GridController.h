@@ -104,7 +104,8 @@ public:
     void clearFilterItems();
     // "TSDATE is this week", "(CONTBEZ LIKE 'A%' OR CONTBEZ LIKE 'a%')"; empty without items.
     [[nodiscard]] QString filterText() const;
-    // Today for the period conditions; evaluated whenever the filter is applied.
+    // Today for the period conditions (default: the program clock); read whenever the filter
+    // is applied.
     void setTodayProvider(std::function<QDate()> today);
     [[nodiscard]] QDate today() const;
 

@@ -13,6 +13,7 @@
 //   Text      ISO 8859-1 bytes from textValue()
 
 #include <QByteArrayView>
+#include <QDateTime>
 #include <QString>
 #include <QVariant>
 

@@ -384,6 +384,12 @@ void GridView::mousePressEvent(QMouseEvent* event)
     }
 }
 
+void GridView::mouseReleaseEvent(QMouseEvent* event)
+{
+    // The press did all the work; the release is ours too, not the parent's.
+    event->accept();
+}
+
 void GridView::mouseDoubleClickEvent(QMouseEvent* event)
 {
     const int row = rowAt(event->position().toPoint());
