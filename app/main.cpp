@@ -1,7 +1,6 @@
-#include <QApplication>
+#include "app/Startup.h"
 
 int main(int argc, char* argv[])
 {
-    QApplication app(argc, argv);
-    return 0;
+    return orvanta::Startup::run(argc, argv);
 }
