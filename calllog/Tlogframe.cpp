@@ -275,14 +275,18 @@ void Tlogframe::buildColumns()
     auto fields = std::make_shared<LogFieldIndexes>();
     m_fieldIndexes = fields;
 
-    const auto add = [this](const char* field, const QString& caption, int tag, int width, bool visible) {
+    // The design widths suit a narrow 8-point font; a wider one gets them in proportion, so that
+    // a date still fits its column.
+    const double scale =
+        std::max(1.0, m_view->fontMetrics().horizontalAdvance(QStringLiteral("00.00.0000")) / 56.0);
+    const auto add = [scale](const char* field, const QString& caption, int tag, int width, bool visible) {
         GridColumn c;
         c.name = columnName(field);
         c.fieldName = QLatin1String(field);
         c.caption = caption;
         c.tag = tag;
         if (width > 0)
-            c.width = width;
+            c.width = static_cast<int>(width * scale + 0.5);
         c.visible = visible;
         return c;
     };

@@ -1,0 +1,276 @@
+// The call-log list on large logs: a database with N generated calls, the list frame built
+// offscreen over the data module as in the program, and each step timed against the raw fetch
+// of "SELECT * FROM LOG" (every value read, nothing kept) measured in the same run:
+//
+//   open     Firstep on the whole log until the rows are painted and the count is posted
+//   sort     a click on the "Anrufer" header
+//   group    grouping by "Anrufer"
+//   filter   the "diese Woche" period filter
+//   refresh  Refresh_View (a re-read of the log, focus kept)
+//
+// The caches of sort keys are dropped before sort, group and filter, so each is timed cold.
+// Memory: the record store, and the process's resident size before and after opening.
+//
+//   bench_loglist [--max N] [--dir FOLDER]      sizes 10 000, 100 000 and 1 000 000 up to N
+
+#include "calllog/Tlogframe.h"
+#include "db/CredentialCipher.h"
+#include "db/FbAttachment.h"
+#include "db/FbStatement.h"
+#include "db/FbTransaction.h"
+#include "db/Schema.h"
+#include "db/SqlScript.h"
+#include "db/TDM2.h"
+#include "platform/ProgramFolder.h"
+#include "platform/Registry.h"
+#include "platform/WindowMessages.h"
+#include "tools/demo/DemoData.h"
+#include "ui/grid/GridController.h"
+#include "ui/grid/GridView.h"
+
+#include <QApplication>
+#include <QDir>
+#include <QElapsedTimer>
+#include <QFile>
+#include <QTemporaryDir>
+
+#include <cstdio>
+#include <cstring>
+
+using namespace orvanta;
+
+namespace {
+
+// Counts the status messages the frame posts.
+class Host final : public QObject {
+public:
+    int statusMessages = 0;
+    qintptr lastCount = -1;
+
+protected:
+    void customEvent(QEvent* event) override
+    {
+        if (WindowMessageEvent* m = asWindowMessage(event); m && m->message() == WMSTATUSPANEL) {
+            ++statusMessages;
+            lastCount = m->wParam();
+        }
+    }
+};
+
+// Every value of every row read from the fetch buffer; nothing kept.
+quint64 rawFetch(FbAttachment& db, FbTransaction& tx)
+{
+    quint64 checksum = 0;
+    if (tx.isActive())
+        tx.rollback();
+    tx.start();
+    FbStatement st(db, &tx, QStringLiteral("SELECT * FROM LOG"));
+    st.execute();
+    const int n = st.columnCount();
+    while (st.next()) {
+        const unsigned char* row = st.rowData();
+        for (int i = 0; i < n; ++i) {
+            const FbSlot& s = st.slot(i);
+            short null;
+            std::memcpy(&null, row + s.nullOffset, sizeof null);
+            if (null)
+                continue;
+            const unsigned char* v = row + s.offset;
+            int len = 0;
+            switch (s.storage) {
+            case FbSlot::Storage::VarText: {
+                quint16 l;
+                std::memcpy(&l, v, 2);
+                len = l;
+                v += 2;
+                break;
+            }
+            case FbSlot::Storage::Text:
+                len = s.length;
+                break;
+            case FbSlot::Storage::I16:
+                len = 2;
+                break;
+            case FbSlot::Storage::I64:
+            case FbSlot::Storage::F64:
+            case FbSlot::Storage::Timestamp:
+                len = 8;
+                break;
+            default:
+                len = 4;
+                break;
+            }
+            for (int k = 0; k < len; ++k)
+                checksum = checksum * 31 + v[k];
+        }
+    }
+    tx.commit();
+    return checksum;
+}
+
+qint64 residentKiB()
+{
+    QFile f(QStringLiteral("/proc/self/status"));
+    if (!f.open(QIODevice::ReadOnly))
+        return -1;
+    for (const QByteArray& line : f.readAll().split('\n')) {
+        if (line.startsWith("VmRSS:"))
+            return line.mid(6).trimmed().split(' ').first().toLongLong();
+    }
+    return -1;
+}
+
+double ms(qint64 ns)
+{
+    return double(ns) / 1e6;
+}
+
+// The frame's work is done when its rows are on screen: paint the viewport once.
+void paint(Tlogframe& frame)
+{
+    frame.view()->viewport()->grab();
+}
+
+int usage()
+{
+    std::fprintf(stderr, "usage: bench_loglist [--max N] [--dir FOLDER]\n");
+    return 2;
+}
+
+} // namespace
+
+int main(int argc, char* argv[])
+{
+    if (qEnvironmentVariableIsEmpty("QT_QPA_PLATFORM"))
+        qputenv("QT_QPA_PLATFORM", "offscreen");
+    QApplication app(argc, argv);
+    qint64 maxCalls = 1'000'000;
+    QString folder;
+    const QStringList args = app.arguments();
+    for (qsizetype i = 1; i < args.size(); ++i) {
+        if (args[i] == QLatin1String("--max") && i + 1 < args.size()) {
+            bool ok = false;
+            maxCalls = args[++i].toLongLong(&ok);
+            if (!ok || maxCalls < 1)
+                return usage();
+        } else if (args[i] == QLatin1String("--dir") && i + 1 < args.size()) {
+            folder = args[++i];
+        } else {
+            return usage();
+        }
+    }
+    QTemporaryDir temp(folder.isEmpty() ? QDir::tempPath() + QStringLiteral("/bench_loglist-XXXXXX")
+                                        : folder + QStringLiteral("/bench_loglist-XXXXXX"));
+    if (!temp.isValid()) {
+        std::fprintf(stderr, "no temporary folder\n");
+        return 1;
+    }
+    qputenv("VARNIK_HKLM", temp.filePath(QStringLiteral("hklm.ini")).toLocal8Bit());
+    // No layout file of an earlier run (or size) may change what is measured.
+    setProgramFolder(temp.path());
+
+    std::printf("Log list, times as ratios to the raw fetch of SELECT * FROM LOG (best of 3) in the same run\n");
+    std::printf("%9s %9s | %7s %7s %7s %7s %7s | %8s %8s %8s | %9s %9s\n", "calls", "raw ms", "open", "sort", "group",
+                "filter", "refresh", "sort ms", "group ms", "filt ms", "store MiB", "RSS+ MiB");
+    const QDate lastDay = QDate::currentDate();
+    for (const qint64 calls : {qint64(10'000), qint64(100'000), qint64(1'000'000)}) {
+        if (calls > maxCalls)
+            break;
+        const QString path = temp.filePath(QStringLiteral("log%1.fdb").arg(calls));
+        try {
+            FbAttachment::createDatabase(path, QStringLiteral("SYSDBA"), QStringLiteral("masterkey"), 8192, false);
+            {
+                FbAttachment db;
+                db.attach(path, QStringLiteral("SYSDBA"), QStringLiteral("masterkey"));
+                SqlScript::run(db, schemaScript());
+                demo::generateCalls(db, calls, 4711, lastDay);
+                db.disconnect();
+            }
+            Registry registry(RegistryRoot::LocalMachine);
+            registry.openKey(QString::fromLatin1(TDM2::kRegistryKey), true);
+            registry.writeString(QStringLiteral("Database"), path);
+            registry.writeString(QStringLiteral("Username"), CredentialCipher::encrypt(QStringLiteral("SYSDBA")));
+            registry.writeString(QStringLiteral("Password"), CredentialCipher::encrypt(QStringLiteral("masterkey")));
+
+            TDM2 dm;
+            if (!dm.IBDatabase1.isConnected()) {
+                std::fprintf(stderr, "cannot connect to %s\n", qPrintable(path));
+                return 1;
+            }
+            rawFetch(dm.IBDatabase1, dm.logts); // warm the page cache
+            qint64 raw = std::numeric_limits<qint64>::max();
+            for (int run = 0; run < 3; ++run) {
+                QElapsedTimer t;
+                t.start();
+                rawFetch(dm.IBDatabase1, dm.logts);
+                raw = std::min(raw, t.nsecsElapsed());
+            }
+
+            if (qEnvironmentVariableIsSet("BENCH_LOGLIST_DETAIL")) {
+                QElapsedTimer d;
+                d.start();
+                dm.ibcds_log.open();
+                std::printf("data set open alone: %.2fx\n", double(d.nsecsElapsed()) / double(raw));
+                dm.ibcds_log.close();
+            }
+            Host host;
+            Tlogframe frame(&dm);
+            frame.resize(1000, 700);
+            frame.show();
+            const qint64 rssBefore = residentKiB();
+            QElapsedTimer t;
+            t.start();
+            frame.Firstep(&host);
+            QCoreApplication::sendPostedEvents(&host, WindowMessageEvent::eventType());
+            paint(frame);
+            const qint64 open = t.nsecsElapsed();
+            const qint64 rssAfter = residentKiB();
+            if (host.statusMessages == 0 || host.lastCount != calls)
+                std::fprintf(stderr, "warning: status count %lld, expected %lld\n", qlonglong(host.lastCount),
+                             qlonglong(calls));
+
+            GridController* g = frame.controller();
+            const int anrufer = g->columnByCaption(QStringLiteral("Anrufer"));
+
+            g->reapply();
+            t.restart();
+            g->headerClicked(anrufer, Qt::NoModifier);
+            paint(frame);
+            const qint64 sort = t.nsecsElapsed();
+
+            frame.ToGroup(0);
+            g->reapply();
+            t.restart();
+            frame.ToGroup(2);
+            paint(frame);
+            const qint64 group = t.nsecsElapsed();
+
+            frame.ToGroup(0);
+            g->reapply();
+            t.restart();
+            frame.SetNewFilter(2);
+            paint(frame);
+            const qint64 filter = t.nsecsElapsed();
+            frame.SetNewFilter(0);
+
+            t.restart();
+            frame.Refresh_View(dm.CurLogLID);
+            paint(frame);
+            const qint64 refresh = t.nsecsElapsed();
+
+            const double storeMiB = double(dm.ibcds_log.store().byteSize()) / (1024.0 * 1024.0);
+            const double rssMiB = rssBefore >= 0 && rssAfter >= 0 ? double(rssAfter - rssBefore) / 1024.0 : -1.0;
+            std::printf("%9lld %9.1f | %6.2fx %6.2fx %6.2fx %6.2fx %6.2fx | %8.1f %8.1f %8.1f | %9.1f %9.1f\n",
+                        qlonglong(calls), ms(raw), double(open) / double(raw), double(sort) / double(raw),
+                        double(group) / double(raw), double(filter) / double(raw), double(refresh) / double(raw),
+                        ms(sort), ms(group), ms(filter), storeMiB, rssMiB);
+            std::fflush(stdout);
+        } catch (const std::exception& e) {
+            std::fprintf(stderr, "%lld calls: %s\n", qlonglong(calls), e.what());
+            return 1;
+        }
+        QFile::remove(path);
+    }
+    std::printf("targets at 1 000 000 calls: open <= 1.50x; sort, group, filter <= 300 ms each\n");
+    return 0;
+}
