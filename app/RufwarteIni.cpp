@@ -17,8 +17,6 @@ namespace orvanta {
 
 namespace {
 
-TRufwarteIni* g_settings = nullptr;
-
 // The monitor's settings report their failures straight to the user, not through the error log.
 void showFailure(const char* operation, const std::exception& e)
 {
@@ -196,16 +194,6 @@ void TRufwarteIni::setMNSAL(std::int32_t value)
 void TRufwarteIni::setCBC(const QString& value)
 {
     m_cbc = value.left(10);
-}
-
-TRufwarteIni* rufwarteIni()
-{
-    return g_settings;
-}
-
-void setRufwarteIni(TRufwarteIni* settings)
-{
-    g_settings = settings;
 }
 
 } // namespace orvanta

@@ -147,8 +147,4 @@ private:
     std::int32_t m_ra = 16;
 };
 
-// The program's one settings object, owned by the main window; nullptr outside its lifetime.
-[[nodiscard]] TRufwarteIni* rufwarteIni();
-void setRufwarteIni(TRufwarteIni* settings);
-
 } // namespace orvanta
