@@ -23,7 +23,7 @@ AreaCodeTable::AreaCodeTable(std::vector<int> prefixLengths)
 {
     std::sort(m_prefixLengths.begin(), m_prefixLengths.end());
     m_prefixLengths.erase(std::remove_if(m_prefixLengths.begin(), m_prefixLengths.end(),
-                              [](int n) { return n < 1 || n > 9; }),
+                              [](int n) { return n < 1 || n > kMaxPrefixLength; }),
         m_prefixLengths.end());
     m_maxLength = m_prefixLengths.empty() ? 0 : m_prefixLengths.back();
     m_offsets.assign(static_cast<std::size_t>(m_maxLength) + 2, 0);

@@ -14,8 +14,11 @@ namespace orvanta {
 
 class AreaCodeTable final {
 public:
-    // prefixLengths: the lengths tried at lookup, increasing (Germany 2..5, Austria 1..4,
-    // Switzerland 1..2).
+    // The index holds a slot for every digit string up to this length.
+    static constexpr int kMaxPrefixLength = 6;
+
+    // prefixLengths: the lengths tried at lookup (Germany 2..5, Austria 1..4, Switzerland 1..2);
+    // lengths outside 1..kMaxPrefixLength are dropped.
     explicit AreaCodeTable(std::vector<int> prefixLengths);
 
     void clear();
