@@ -63,11 +63,23 @@ int insertCall(FbAttachment& db, const QString& fromPhone, const QString& onMsn)
     FbTransaction tx(db);
     tx.start();
     try {
-        FbStatement key(db, &tx, QStringLiteral("SELECT GEN_ID(GEN_LOG_ID, 1) FROM RDB$DATABASE"));
+        // Rows written by others (tests, imports) may have taken keys past the generator.
+        FbStatement key(db, &tx,
+                        QStringLiteral("SELECT GEN_ID(GEN_LOG_ID, 1), (SELECT COALESCE(MAX(LID), 0) FROM LOG) "
+                                       "FROM RDB$DATABASE"));
         key.execute();
         key.next();
-        const int lid = key.asInt(0);
+        int lid = key.asInt(0);
+        const int highest = key.asInt(1);
         key.close();
+        if (lid <= highest) {
+            FbStatement skip(db, &tx, QStringLiteral("SELECT GEN_ID(GEN_LOG_ID, CAST(:STEP AS INTEGER)) FROM RDB$DATABASE"));
+            skip.setParam(u"STEP", highest - lid + 1);
+            skip.execute();
+            skip.next();
+            lid = skip.asInt(0);
+            skip.close();
+        }
         const QDateTime now = QDateTime::currentDateTime();
         const QTime time(now.time().hour(), now.time().minute(), now.time().second());
         FbStatement insert(db, &tx,

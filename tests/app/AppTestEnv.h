@@ -1,0 +1,189 @@
+#pragma once
+// What the main-window tests need: a temporary program folder with the monitor's settings file,
+// a fresh database reached through the registry as at a real start, a private runtime folder
+// (mutexes, message sockets), scripted dialogs and a fixed clock. The main window itself creates
+// the error log.
+
+#include "app/TLogform.h"
+#include "db/CredentialCipher.h"
+#include "db/TDM2.h"
+#include "platform/Clock.h"
+#include "platform/ProgramFolder.h"
+#include "platform/Registry.h"
+#include "platform/WindowMessages.h"
+#include "tests/support/ScriptedDialogService.h"
+#include "tests/support/TempDatabase.h"
+#include "ui/frames/LogListFrame.h"
+
+#include <QFile>
+#include <QTemporaryDir>
+#include <QTest>
+
+#include <functional>
+#include <memory>
+
+namespace orvanta::test {
+
+class AppTestEnv final {
+public:
+    static QDate today() { return {2024, 5, 15}; }
+
+    AppTestEnv()
+        : m_clock(QDateTime(today(), QTime(12, 0)))
+    {
+        m_runtime.setAutoRemove(true);
+        qputenv("XDG_RUNTIME_DIR", m_runtime.path().toLocal8Bit());
+        qputenv("VARNIK_HKLM", m_dir.filePath(QStringLiteral("hklm.ini")).toLocal8Bit());
+        setProgramFolder(m_dir.path());
+        writeFile(QStringLiteral("ISDNStore"), "[MoniOptions]\r\nAC=1\r\n");
+        Registry r(RegistryRoot::LocalMachine);
+        if (r.openKey(QStringLiteral("software\\Varnik\\rufwarte"), true)) {
+            r.writeString(QStringLiteral("Database"), m_db.path());
+            r.writeString(QStringLiteral("Username"), CredentialCipher::encrypt(QStringLiteral("SYSDBA")));
+            r.writeString(QStringLiteral("Password"), CredentialCipher::encrypt(QStringLiteral("masterkey")));
+        }
+    }
+    ~AppTestEnv()
+    {
+        m_window.reset();
+        m_dm.reset();
+        setProgramFolder(QString());
+        qunsetenv("VARNIK_HKLM");
+    }
+    AppTestEnv(const AppTestEnv&) = delete;
+    AppTestEnv& operator=(const AppTestEnv&) = delete;
+
+    TempDatabase& db() { return m_db; }
+    TDM2& dm()
+    {
+        if (!m_dm)
+            m_dm = std::make_unique<TDM2>();
+        return *m_dm;
+    }
+    ScriptedDialogService& dialogs() { return m_dialogs.service(); }
+    [[nodiscard]] QString folder() const { return m_dir.path(); }
+    [[nodiscard]] QString runtimeFolder() const { return m_runtime.path(); }
+    [[nodiscard]] QString file(const QString& name) const { return m_dir.filePath(name); }
+    void writeFile(const QString& name, const QByteArray& bytes) const
+    {
+        QFile f(file(name));
+        if (f.open(QIODevice::WriteOnly | QIODevice::Truncate))
+            f.write(bytes);
+    }
+    [[nodiscard]] QByteArray readFile(const QString& name) const
+    {
+        QFile f(file(name));
+        return f.open(QIODevice::ReadOnly) ? f.readAll() : QByteArray();
+    }
+
+    void addCall(int lid, const QString& date, const QString& fromphone, const QString& frombez = QString())
+    {
+        m_db.exec(QStringLiteral("INSERT INTO LOG (LID, TSDATE, TSTIME, FROMBEZ, FROMPHONE, CTYPE, SERVICE, STATUS) "
+                                 "VALUES (%1, '%2', '10:00:00', '%3', '%4', 0, 1, 'angenommen')")
+                      .arg(lid)
+                      .arg(date, frombez, fromphone));
+    }
+
+    // The main window on the data module (created on first use) with the given parameters.
+    TLogform& window(const QStringList& parameters = {}, MainWindowFactories factories = {})
+    {
+        if (!m_window)
+            m_window = std::make_unique<TLogform>(&dm(), parameters, std::move(factories));
+        return *m_window;
+    }
+    [[nodiscard]] TLogform* existingWindow() const { return m_window.get(); }
+    void destroyWindow() { m_window.reset(); }
+
+private:
+    QTemporaryDir m_dir;
+    QTemporaryDir m_runtime;
+    ScopedFixedClock m_clock;
+    ScopedScriptedDialogs m_dialogs;
+    TempDatabase m_db;
+    std::unique_ptr<TDM2> m_dm;
+    std::unique_ptr<TLogform> m_window;
+};
+
+// A log list that records what the host asks of it; Refresh_View can take its time.
+class RecordingLogFrame final : public LogListFrame {
+public:
+    using LogListFrame::LogListFrame;
+
+    QStringList calls;
+    int refreshMs = 0;
+    int whatsOnFilter = 0;
+    int whatsOnGroup = 0;
+    int currentLid = -1;
+    bool busy = false;
+    std::function<void()> onToGroup;
+
+    void setViewMode(int mode) override { m_mode = mode; }
+    int viewMode() const override { return m_mode; }
+    void setLogDay(QDate day) override { m_day = day; }
+    QDate logDay() const override { return m_day; }
+    void setNoLog(bool noLog) override { calls << QStringLiteral("setNoLog %1").arg(noLog); }
+    void setCaptionText(const QString& text) override { m_caption = text; }
+    QString captionText() const override { return m_caption; }
+    bool isBusy() const override { return busy; }
+    void setBusy(bool b) override { busy = b; }
+    bool Firstep(QObject*) override
+    {
+        calls << QStringLiteral("Firstep");
+        return true;
+    }
+    bool OpenDBonDay(QDate day) override
+    {
+        m_day = day;
+        calls << QStringLiteral("OpenDBonDay ") + day.toString(Qt::ISODate);
+        return true;
+    }
+    void SetNewFilter(int kind) override { calls << QStringLiteral("SetNewFilter %1").arg(kind); }
+    void ToGroup(int kind) override
+    {
+        calls << QStringLiteral("ToGroup %1").arg(kind);
+        if (onToGroup)
+            onToGroup();
+    }
+    void WhatsOn(int& f, int& g) override
+    {
+        f = whatsOnFilter;
+        g = whatsOnGroup;
+    }
+    void SetTableViewPopup() override { calls << QStringLiteral("SetTableViewPopup"); }
+    void Refresh_View(int lid) override
+    {
+        calls << QStringLiteral("Refresh_View %1").arg(lid);
+        if (refreshMs > 0)
+            QTest::qWait(refreshMs);
+        calls << QStringLiteral("Refresh_View done");
+    }
+    bool StoreLogView() override
+    {
+        calls << QStringLiteral("StoreLogView");
+        return true;
+    }
+    bool CanExpandGroups() const override { return false; }
+    void ExpandAllGroups(bool) override {}
+    int CurrentLogLID() const override { return currentLid; }
+
+private:
+    int m_mode = 0;
+    QDate m_day;
+    QString m_caption;
+};
+
+// Factories whose log list is a RecordingLogFrame; the created frames land in *frames.
+inline MainWindowFactories recordingFactories(QList<QPointer<RecordingLogFrame>>* frames)
+{
+    MainWindowFactories f;
+    f.logFrame = [frames](QWidget* parent) -> LogListFrame* {
+        auto* frame = new RecordingLogFrame(parent);
+        frames->append(frame);
+        return frame;
+    };
+    f.logDetailWindow = [](QWidget*, int, int) -> QWidget* { return new QWidget; };
+    f.contactEditWindow = [](QWidget*, int, int) -> QWidget* { return new QWidget; };
+    return f;
+}
+
+} // namespace orvanta::test
