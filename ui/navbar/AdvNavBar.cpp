@@ -42,7 +42,6 @@ AdvNavBar::AdvNavBar(QWidget* parent)
     m_caption->setContentsMargins(6, 0, 6, 0);
     QFont f = m_caption->font();
     f.setBold(true);
-    f.setPointSizeF(f.pointSizeF() * 1.15);
     m_caption->setFont(f);
     m_stack = new QStackedWidget(this);
     m_buttonBox = new QVBoxLayout;
