@@ -122,8 +122,8 @@ public:
     [[nodiscard]] QString groupValueText(int row) const;
     // "Anrufer: Meier (12)"
     [[nodiscard]] QString groupRowText(int row) const;
-    // Data rows below a group row (all of them for an invalid row), in display order,
-    // regardless of expansion: for exports and reports.
+    // Every record passing the filter, in display order and regardless of expansion: for
+    // exports and reports.
     [[nodiscard]] std::vector<quint32> recordsInOrder() const { return m_order; }
     // Display text of a data row's cell ("" for group rows), only ever formatted on request.
     [[nodiscard]] QString displayText(int row, int c) const;

@@ -1,5 +1,7 @@
 #include "ui/grid/MemoryGridSource.h"
 
+#include "platform/AppException.h"
+
 #include <bit>
 
 namespace orvanta {
@@ -96,6 +98,8 @@ void MemoryGridSource::setText(quint32 row, int field, QStringView text)
 void MemoryGridSource::setLatin1(quint32 row, int field, QByteArrayView bytes)
 {
     Column& c = m_columns.at(static_cast<size_t>(field));
+    if (static_cast<quint64>(c.arena.size()) + static_cast<quint64>(bytes.size()) > 0xFFFF'FFFFull)
+        throw AppException(QStringLiteral("Zu viel Text für die Tabelle."));
     // Rewriting a cell appends: the old bytes stay in the arena until clear().
     c.textStart.at(row) = static_cast<quint32>(c.arena.size());
     c.textLen[row] = static_cast<quint32>(bytes.size());
