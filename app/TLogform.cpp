@@ -60,6 +60,11 @@ TLogform::TLogform(TDM2* dm, const QStringList& parameters, MainWindowFactories 
     m_maintenance = std::make_unique<LogMaintenance>(dm);
     m_monitor = std::make_unique<MonitorLink>(this);
     m_launcher = new ProgramLauncher(this);
+    // The import program changes contacts: reload the list when it has finished.
+    connect(m_launcher, &ProgramLauncher::finishedWaiting, this, [this] {
+        if (m_contactFrame)
+            m_contactFrame->Refresh_View(0);
+    });
 
     buildLayout();
     buildActions();

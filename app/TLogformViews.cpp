@@ -132,15 +132,7 @@ void TLogform::AdvNavBar1Change()
     try {
         m_statusBar->setPanelText(2, QString());
         freeFrames();
-        const int tab = m_navBar->activeTabIndex();
-        const bool logView = tab == TabCalendar || tab == TabLog;
-        // The frame's own actions belong to the log views; the contact ones to the contacts.
-        action(QStringLiteral("_LogFo_LogSearch"))->setVisible(false);
-        action(QStringLiteral("_LogFo_Search"))->setVisible(false);
-        action(QStringLiteral("_LogFo_Expand"))->setVisible(true);
-        action(QStringLiteral("_LogFo_Collapse"))->setVisible(true);
-        Q_UNUSED(logView);
-        switch (tab) {
+        switch (m_navBar->activeTabIndex()) {
         case TabContacts:
             showContactFrame();
             break;

@@ -1,4 +1,5 @@
 #include "app/MainWindowFactories.h"
+#include "app/ProgramLauncher.h"
 #include "app/TLogform.h"
 #include "platform/IniFile.h"
 #include "tests/app/AppTestEnv.h"
@@ -13,6 +14,7 @@
 #include <QElapsedTimer>
 #include <QMenuBar>
 #include <QRadioButton>
+#include <QSignalSpy>
 #include <QTest>
 #include <QTextEdit>
 #include <QToolBar>
@@ -497,6 +499,30 @@ private Q_SLOTS:
         frames.last()->busy = false;
         w.updateActions();
         QVERIFY(act(w, "_LogFo_DelDayLog")->isEnabled());
+    }
+
+    void companionProgramsStartFromTheProgramFolder()
+    {
+        AppTestEnv env;
+        TLogform& w = env.window();
+        env.writeFile(QStringLiteral("About"), "#!/bin/sh\necho about > \"$(pwd)/about.out\"\n");
+        env.writeFile(QStringLiteral("OEImp"), "#!/bin/sh\necho \"$@\" > \"$(pwd)/import.out\"\n");
+        for (const char* f : {"About", "OEImp"})
+            QFile::setPermissions(env.file(QLatin1String(f)), QFile::ReadOwner | QFile::WriteOwner | QFile::ExeOwner);
+
+        trigger(w, "_LogFo_About");
+        QTRY_VERIFY(QFileInfo::exists(env.file(QStringLiteral("about.out"))));
+
+        QSignalSpy finished(&w.launcher(), &ProgramLauncher::finishedWaiting);
+        QVERIFY(w.launcher().start(QStringLiteral("OEImp.exe"), {QStringLiteral("-OEImpRufwarte")}, true));
+        QVERIFY(w.launcher().isWaiting());
+        QTRY_COMPARE(finished.size(), 1);
+        QVERIFY(!w.launcher().isWaiting());
+        QCOMPARE(env.readFile(QStringLiteral("import.out")).trimmed(), QByteArray("-OEImpRufwarte"));
+
+        QVERIFY(!w.launcher().start(QStringLiteral("AppSetup.exe"), {}, false));
+        QVERIFY(env.dialogs().last().text.startsWith(QStringLiteral("# Orvanta - StartProgram\r\n")));
+        QVERIFY(env.dialogs().last().text.contains(QStringLiteral("AppSetup.exe")));
     }
 
     void withoutADatabaseTheNavigationIsDisabled()
