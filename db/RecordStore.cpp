@@ -232,21 +232,24 @@ void RecordStore::appendRow(const FbStatement& statement)
                 setNull(c, r);
             } else if (s.storage == FbSlot::Storage::VarText) {
                 const quint16 len = load<quint16>(v);
-                std::memcpy(c.arena.grow(len), v + 2, len);
+                if (len > 0) // an empty arena has no buffer to copy nothing into
+                    std::memcpy(c.arena.grow(len), v + 2, len);
                 end += len;
                 m_valueBytes += len;
             } else if (s.storage == FbSlot::Storage::Text) {
                 int len = s.length;
                 while (len > 0 && v[len - 1] == ' ')
                     --len;
-                std::memcpy(c.arena.grow(size_t(len)), v, size_t(len));
+                if (len > 0)
+                    std::memcpy(c.arena.grow(size_t(len)), v, size_t(len));
                 end += quint32(len);
                 m_valueBytes += len;
             } else {
                 const QByteArray blob = statement.readBlob(int(i));
                 if (c.arena.size + size_t(blob.size()) > 0xFFFFFFFFu)
                     throw std::bad_alloc();
-                std::memcpy(c.arena.grow(size_t(blob.size())), blob.constData(), size_t(blob.size()));
+                if (!blob.isEmpty())
+                    std::memcpy(c.arena.grow(size_t(blob.size())), blob.constData(), size_t(blob.size()));
                 end += quint32(blob.size());
                 m_valueBytes += blob.size();
             }
