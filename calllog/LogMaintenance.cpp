@@ -72,10 +72,8 @@ bool LogMaintenance::gettinglogdates(PlannerCalendar& calendar)
     DataSet& query = m_dm->LogAllgemeinQuery;
     try {
         query.close();
-        if (tx.isActive())
-            tx.rollback();
         query.setCommandText(QStringLiteral("SELECT DISTINCT TSDATE FROM LOG"));
-        tx.start();
+        TDM2::restart(tx);
         query.open();
         if (!query.isActive()) {
             tx.rollbackQuietly();
@@ -91,8 +89,7 @@ bool LogMaintenance::gettinglogdates(PlannerCalendar& calendar)
             calendar.addEvent(day, QStringLiteral("Protokoll vom ") + day.toString(kDateFormat));
         }
         query.close();
-        if (tx.isActive())
-            tx.commit();
+        TDM2::commitIfActive(tx);
         return true;
     } catch (const std::exception& e) {
         query.close();
@@ -148,11 +145,9 @@ bool LogMaintenance::deleteWhere(const QString& sql, const QString& param, const
     DataSet& query = m_dm->LogAllgemeinQuery;
     try {
         query.close();
-        if (tx.isActive())
-            tx.rollback();
         query.setCommandText(sql);
         query.setParam(param, value);
-        tx.start();
+        TDM2::restart(tx);
         query.execSQL();
         if (mainWindow)
             postMessage(mainWindow, WMUPDATEVOICEBOXGRID, 0, 0);
@@ -190,9 +185,7 @@ bool LogMaintenance::GetFromphoneByLog(int lid, QString& number)
     DataSet& query = m_dm->GetFromNr;
     try {
         query.close();
-        if (tx.isActive())
-            tx.rollback();
-        tx.start();
+        TDM2::restart(tx);
         query.setParam(QStringLiteral("ID"), lid);
         query.open();
         QString failure;
@@ -203,8 +196,7 @@ bool LogMaintenance::GetFromphoneByLog(int lid, QString& number)
         else if ((number = (query.first(), query.fieldByName(u"FROMPHONE").asString())).isEmpty())
             failure = QStringLiteral("Die Telefonnummer des Anrufers im Protokolleintrag ist leer!");
         query.close();
-        if (tx.isActive())
-            tx.commit();
+        TDM2::commitIfActive(tx);
         if (!failure.isEmpty()) {
             number.clear();
             reportError(head + failure + tail);
@@ -233,11 +225,9 @@ int LogMaintenance::CheckOfNumber(const QString& number)
     int key = 0;
     try {
         sql.close();
-        if (tx.isActive())
-            tx.rollback();
         sql.setSql(QStringLiteral("EXECUTE PROCEDURE P_SELECT_LOG_CONTACT(:PHONENR)"));
         sql.setParam(QStringLiteral("PHONENR"), number);
-        tx.start();
+        TDM2::restart(tx);
         sql.execute();
         label = sql.isNull(1) ? QString() : sql.asString(1);
         name = sql.isNull(2) ? QString() : sql.asString(2);
@@ -273,11 +263,9 @@ bool LogMaintenance::LogCheckOfNumber(const QString& number)
     FbStatement& sql = m_dm->NumCheck_SQL;
     try {
         sql.close();
-        if (tx.isActive())
-            tx.rollback();
         sql.setSql(QStringLiteral("EXECUTE PROCEDURE P_GET_COUNT_OF_NUMBER(:PN)"));
         sql.setParam(QStringLiteral("PN"), number);
-        tx.start();
+        TDM2::restart(tx);
         sql.execute();
         const bool found = !sql.isNull(0) && sql.asInt64(0) > 0;
         sql.close();
@@ -300,8 +288,6 @@ bool LogMaintenance::LogbuchAnpassen(const QString& number, const QString& numbe
     FbStatement& sql = m_dm->NumCheck_SQL;
     try {
         sql.close();
-        if (tx.isActive())
-            tx.rollback();
         sql.setSql(QStringLiteral("UPDATE LOG SET FROMBEZ = :FB,FROMANSCHLUSS = :FA,CID = :C "
                                   "WHERE (FROMPHONE = :FP)or(FROMSUBB = :FS)"));
         sql.setParam(QStringLiteral("FB"), contactName);
@@ -309,7 +295,7 @@ bool LogMaintenance::LogbuchAnpassen(const QString& number, const QString& numbe
         sql.setParam(QStringLiteral("C"), contactKey);
         sql.setParam(QStringLiteral("FP"), number);
         sql.setParam(QStringLiteral("FS"), number);
-        tx.start();
+        TDM2::restart(tx);
         sql.execute();
         tx.commit();
         return true;
