@@ -1,6 +1,7 @@
 #include "db/FbStatement.h"
 
 #include "db/FbPrivate_p.h"
+#include "db/FixedPoint.h"
 #include "db/SqlParams.h"
 
 #include <QHash>
@@ -40,28 +41,8 @@ struct InSig {
     bool operator==(const InSig&) const = default;
 };
 
-qint64 pow10(int n)
-{
-    qint64 r = 1;
-    for (int i = 0; i < n; ++i)
-        r *= 10;
-    return r;
-}
-
-// Rescales a fixed-point value from 'from' to 'to' decimal places, rounding half away from zero.
-qint64 rescale(qint64 v, int from, int to)
-{
-    if (from == to)
-        return v;
-    if (to > from)
-        return v * pow10(to - from);
-    const qint64 div = pow10(from - to);
-    const qint64 q = v / div;
-    const qint64 r = v % div;
-    if (2 * (r < 0 ? -r : r) >= div)
-        return q + (v < 0 ? -1 : 1);
-    return q;
-}
+using fixedpoint::pow10;
+using fixedpoint::rescale;
 
 bool isIntegerSqlType(unsigned t)
 {

@@ -2,6 +2,7 @@
 
 #include "db/FbApi_p.h"
 #include "db/FbStatement.h"
+#include "db/FixedPoint.h"
 
 #include <cmath>
 #include <cstdlib>
@@ -15,27 +16,8 @@ namespace {
 constexpr qint64 kMsPerDay = 86400000;
 constexpr qint64 kEpochJulianDay = 2440588; // 1 Jan 1970
 
-qint64 pow10(int n)
-{
-    qint64 r = 1;
-    for (int i = 0; i < n; ++i)
-        r *= 10;
-    return r;
-}
-
-qint64 rescale(qint64 v, int from, int to)
-{
-    if (from == to)
-        return v;
-    if (to > from)
-        return v * pow10(to - from);
-    const qint64 div = pow10(from - to);
-    const qint64 q = v / div;
-    const qint64 r = v % div;
-    if (2 * (r < 0 ? -r : r) >= div)
-        return q + (v < 0 ? -1 : 1);
-    return q;
-}
+using fixedpoint::pow10;
+using fixedpoint::rescale;
 
 template <typename T>
 T load(const void* p)
