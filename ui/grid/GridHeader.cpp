@@ -6,6 +6,8 @@
 #include <QMouseEvent>
 #include <QStyleOptionHeader>
 
+#include <utility>
+
 namespace orvanta {
 
 GridHeader::GridHeader(GridController* controller, QWidget* parent)
@@ -45,12 +47,14 @@ void GridHeader::mousePressEvent(QMouseEvent* event)
     m_modifiers = event->modifiers();
     m_pressed = -1;
     m_dragging = false;
+    m_resizing = false;
     if (event->button() == Qt::LeftButton) {
         const int logical = logicalIndexAt(event->position().toPoint());
         // Not near a section edge: edges belong to resizing.
         const int pos = event->position().toPoint().x();
         const int left = logical >= 0 ? sectionViewportPosition(logical) : 0;
         const bool nearEdge = logical >= 0 && (pos - left < 4 || left + sectionSize(logical) - pos < 4);
+        m_resizing = nearEdge;
         if (logical >= 0 && !nearEdge) {
             m_pressed = logical;
             m_pressedVisual = visualIndex(logical);
@@ -79,7 +83,10 @@ void GridHeader::mouseReleaseEvent(QMouseEvent* event)
     const bool dragging = m_dragging;
     m_pressed = -1;
     m_dragging = false;
+    const bool resizing = std::exchange(m_resizing, false);
     QHeaderView::mouseReleaseEvent(event);
+    if (resizing)
+        Q_EMIT resizeFinished();
     if (m_restoreMovable) {
         setSectionsMovable(true);
         m_restoreMovable = false;

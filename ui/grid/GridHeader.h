@@ -20,10 +20,14 @@ public:
     void setGroupByBox(QWidget* box) { m_groupBox = box; }
     // Keyboard modifiers of the last click, for multi-column sorting with Shift.
     [[nodiscard]] Qt::KeyboardModifiers lastModifiers() const { return m_modifiers; }
+    // From a press on a section edge until the release: the user is dragging a section's width.
+    [[nodiscard]] bool isResizing() const { return m_resizing; }
 
 Q_SIGNALS:
     void sectionDraggedOut(int logicalIndex);
     void sectionDroppedOnGroupBox(int logicalIndex);
+    // The mouse let go of a section edge.
+    void resizeFinished();
 
 protected:
     void initStyleOptionForIndex(QStyleOptionHeader* option, int logicalIndex) const override;
@@ -40,6 +44,7 @@ private:
     QPoint m_pressPos;
     bool m_dragging = false;
     bool m_restoreMovable = false;
+    bool m_resizing = false;
 };
 
 } // namespace orvanta

@@ -10,10 +10,63 @@
 #include <QPainter>
 #include <QScrollBar>
 
+#include <algorithm>
+#include <utility>
+
 namespace orvanta {
 namespace {
 constexpr int kIndent = 16;
 constexpr int kPad = 3;
+
+// Splits `total` pixels in proportion to `weights` so that the parts add up to exactly `total`.
+// A part whose share would fall below `minimum` gets the minimum and the others share the rest;
+// when even the minimums do not fit, every part is the minimum.
+std::vector<int> proportionalWidths(const std::vector<int>& weights, int total, int minimum)
+{
+    const size_t n = weights.size();
+    std::vector<int> out(n, minimum);
+    if (n == 0 || total <= minimum * static_cast<int>(n))
+        return out;
+    std::vector<bool> atMinimum(n, false);
+    qint64 room = 0;
+    qint64 weightSum = 0;
+    for (;;) {
+        room = total;
+        weightSum = 0;
+        for (size_t i = 0; i < n; ++i) {
+            if (atMinimum[i])
+                room -= minimum;
+            else
+                weightSum += std::max(1, weights[i]);
+        }
+        bool changed = false;
+        for (size_t i = 0; i < n; ++i) {
+            if (!atMinimum[i] && room * std::max(1, weights[i]) < qint64{minimum} * weightSum) {
+                atMinimum[i] = true;
+                changed = true;
+            }
+        }
+        // The parts left average more than the minimum, so at least one always stays proportional.
+        if (!changed)
+            break;
+    }
+    // Whole pixels first, then the remaining pixels to the largest fractions (earlier columns
+    // first on a tie), so the same weights and total always give the same widths.
+    std::vector<std::pair<qint64, size_t>> fractions;
+    qint64 used = 0;
+    for (size_t i = 0; i < n; ++i) {
+        if (atMinimum[i])
+            continue;
+        const qint64 share = room * std::max(1, weights[i]);
+        out[i] = static_cast<int>(share / weightSum);
+        used += out[i];
+        fractions.emplace_back(share % weightSum, i);
+    }
+    std::stable_sort(fractions.begin(), fractions.end(), [](const auto& a, const auto& b) { return a.first > b.first; });
+    for (size_t k = 0; used < room && k < fractions.size(); ++k, ++used)
+        ++out[fractions[k].second];
+    return out;
+}
 } // namespace
 
 GridView::GridView(QWidget* parent)
@@ -58,6 +111,10 @@ GridView::GridView(QWidget* parent)
     connect(m_header, &QHeaderView::sectionResized, this, [this](int logical, int, int size) {
         if (m_syncing)
             return;
+        if (m_autoWidth) {
+            columnResizedByUser(logical, size);
+            return;
+        }
         // The stretched last section follows the view's width; its own width stays as defined.
         if (m_header->stretchLastSection()) {
             const std::vector<int> visible = m_controller->visibleColumns();
@@ -80,6 +137,7 @@ GridView::GridView(QWidget* parent)
         if (m_controller->isGroupByBoxVisible())
             m_controller->groupBy(logical);
     });
+    connect(m_header, &GridHeader::resizeFinished, this, &GridView::takeSectionWidths);
     connect(m_header, &QWidget::customContextMenuRequested, this, &GridView::showHeaderMenu);
     connect(horizontalScrollBar(), &QScrollBar::rangeChanged, this,
             [this] { m_header->setOffset(horizontalScrollBar()->value()); });
@@ -131,8 +189,97 @@ void GridView::setHeaderHeight(int height)
 
 void GridView::setAutoWidth(bool on)
 {
-    m_header->setStretchLastSection(on);
+    m_autoWidth = on;
+    m_header->setStretchLastSection(false);
+    // Off: the sections get the columns' own widths back.
+    syncHeader();
+}
+
+std::vector<int> GridView::shownSections() const
+{
+    std::vector<int> out;
+    for (int v = 0; v < m_header->count(); ++v) {
+        const int logical = m_header->logicalIndex(v);
+        if (!m_header->isSectionHidden(logical))
+            out.push_back(logical);
+    }
+    return out;
+}
+
+// The columns' own widths stay untouched here: they are the weights, so resizing the window
+// back and forth always gives the same sections and the stored layout keeps the proportions.
+void GridView::fitColumns()
+{
+    if (!m_autoWidth)
+        return;
+    const std::vector<int> shown = shownSections();
+    std::vector<int> weights;
+    for (const int c : shown)
+        weights.push_back(c < m_controller->columnCount() ? m_controller->column(c).width : m_header->sectionSize(c));
+    const int available = std::max(0, viewport()->width() - indentWidth());
+    const std::vector<int> widths = proportionalWidths(weights, available, m_header->minimumSectionSize());
+    const bool wasSyncing = std::exchange(m_syncing, true);
+    for (size_t i = 0; i < shown.size(); ++i) {
+        if (m_header->sectionSize(shown[i]) != widths[i])
+            m_header->resizeSection(shown[i], widths[i]);
+    }
+    m_syncing = wasSyncing;
+}
+
+// The resized column takes its space from the columns to its right, which share the rest by
+// their own widths; the last column's right edge is the view's edge and stays put. The new pixel
+// widths become the columns' widths when the drag ends, so a refit reproduces them exactly and
+// the result depends only on where the mouse was let go, not on the way there.
+void GridView::columnResizedByUser(int logical, int size)
+{
+    const std::vector<int> shown = shownSections();
+    const auto it = std::find(shown.begin(), shown.end(), logical);
+    if (it == shown.end() || it + 1 == shown.end()) {
+        fitColumns();
+        viewport()->update();
+        return;
+    }
+    const size_t k = static_cast<size_t>(it - shown.begin());
+    const int minimum = m_header->minimumSectionSize();
+    const int available = std::max(0, viewport()->width() - indentWidth());
+    int left = 0;
+    for (size_t i = 0; i < k; ++i)
+        left += m_header->sectionSize(shown[i]);
+    std::vector<int> rightWeights;
+    for (size_t i = k + 1; i < shown.size(); ++i) {
+        const int c = shown[i];
+        rightWeights.push_back(c < m_controller->columnCount() ? m_controller->column(c).width : m_header->sectionSize(c));
+    }
+    const int maxSize = available - left - minimum * static_cast<int>(rightWeights.size());
+    size = std::clamp(size, minimum, std::max(minimum, maxSize));
+    const std::vector<int> right = proportionalWidths(rightWeights, available - left - size, minimum);
+
+    const bool wasSyncing = std::exchange(m_syncing, true);
+    if (m_header->sectionSize(logical) != size)
+        m_header->resizeSection(logical, size);
+    for (size_t i = 0; i < right.size(); ++i) {
+        if (m_header->sectionSize(shown[k + 1 + i]) != right[i])
+            m_header->resizeSection(shown[k + 1 + i], right[i]);
+    }
+    m_syncing = wasSyncing;
+    m_widthsPending = true;
+    if (!m_header->isResizing())
+        takeSectionWidths();
     updateScrollBars();
+    viewport()->update();
+}
+
+void GridView::takeSectionWidths()
+{
+    if (!m_widthsPending)
+        return;
+    m_widthsPending = false;
+    m_controller->beginUpdate();
+    for (const int c : shownSections()) {
+        if (c < m_controller->columnCount())
+            m_controller->setColumnWidth(c, m_header->sectionSize(c));
+    }
+    m_controller->endUpdate();
 }
 
 int GridView::indentWidth() const
@@ -201,7 +348,8 @@ void GridView::syncHeader()
         const GridColumn& col = m_controller->column(c);
         if (m_header->isSectionHidden(c) == col.visible)
             m_header->setSectionHidden(c, !col.visible);
-        if (m_header->sectionSize(c) != col.width)
+        // With auto width the fit below sizes the shown sections.
+        if (!m_autoWidth && m_header->sectionSize(c) != col.width)
             m_header->resizeSection(c, col.width);
     }
     const std::vector<int>& order = m_controller->columnOrder();
@@ -229,6 +377,7 @@ void GridView::updateGeometries()
     m_groupBox->setGeometry(vg.left(), vg.top() - m_headerHeight - box, vg.width(), box);
     const int indent = indentWidth();
     m_header->setGeometry(vg.left() + indent, vg.top() - m_headerHeight, std::max(0, vg.width() - indent), m_headerHeight);
+    fitColumns();
 }
 
 void GridView::updateScrollBars()

@@ -12,6 +12,7 @@
 #include <QAbstractScrollArea>
 #include <QPixmap>
 #include <functional>
+#include <vector>
 
 class QMenu;
 
@@ -69,8 +70,12 @@ public:
     [[nodiscard]] QColor sortedColumnColor() const { return m_sortedColor; }
     void setGridLineColor(const QColor& color) { m_lineColor = color; viewport()->update(); }
     void setGroupRowColor(const QColor& color) { m_groupColor = color; viewport()->update(); }
-    // Columns stretch to fill the width (the last one takes the rest).
+    // On: the visible columns always fill the width exactly, each in proportion to its own width,
+    // and there is no horizontal scrolling; a column the user resizes trades space with the
+    // columns to its right. Off: every column has its own width. Before the first call the last
+    // column stretches to the view's edge.
     void setAutoWidth(bool on);
+    [[nodiscard]] bool autoWidth() const { return m_autoWidth; }
 
     // Viewport geometry of a row, empty when it is scrolled out.
     [[nodiscard]] QRect rowRect(int row) const;
@@ -105,6 +110,10 @@ private:
     void syncHeader();
     void updateGeometries();
     void updateScrollBars();
+    void fitColumns();
+    void columnResizedByUser(int logical, int size);
+    void takeSectionWidths();
+    [[nodiscard]] std::vector<int> shownSections() const;
     void ensureRowVisible(int row);
     [[nodiscard]] int indentWidth() const;
     [[nodiscard]] int visibleRowCapacity() const;
@@ -126,6 +135,8 @@ private:
     int m_headerHeight = 21;
     int m_lock = 0;
     bool m_syncing = false;
+    bool m_autoWidth = false;
+    bool m_widthsPending = false;
 };
 
 } // namespace orvanta
