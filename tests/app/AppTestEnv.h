@@ -6,13 +6,10 @@
 
 #include "app/TLogform.h"
 #include "db/CredentialCipher.h"
-#include "db/TDM2.h"
-#include "platform/Clock.h"
 #include "platform/ProgramFolder.h"
 #include "platform/Registry.h"
 #include "platform/WindowMessages.h"
-#include "tests/support/ScriptedDialogService.h"
-#include "tests/support/TempDatabase.h"
+#include "tests/support/ProgramTestEnv.h"
 #include "ui/frames/LogListFrame.h"
 
 #include <QFile>
@@ -29,56 +26,26 @@ public:
     static QDate today() { return {2024, 5, 15}; }
 
     AppTestEnv()
-        : m_clock(QDateTime(today(), QTime(12, 0)))
+        : m_env(QDateTime(today(), QTime(12, 0)), ProgramTestEnv::ErrorLogSetup::None)
     {
-        m_runtime.setAutoRemove(true);
-        qputenv("XDG_RUNTIME_DIR", m_runtime.path().toLocal8Bit());
-        qputenv("VARNIK_HKLM", m_dir.filePath(QStringLiteral("hklm.ini")).toLocal8Bit());
-        setProgramFolder(m_dir.path());
         writeFile(QStringLiteral("ISDNStore"), "[MoniOptions]\r\nAC=1\r\n");
-        Registry r(RegistryRoot::LocalMachine);
-        if (r.openKey(QStringLiteral("software\\Varnik\\rufwarte"), true)) {
-            r.writeString(QStringLiteral("Database"), m_db.path());
-            r.writeString(QStringLiteral("Username"), CredentialCipher::encrypt(QStringLiteral("SYSDBA")));
-            r.writeString(QStringLiteral("Password"), CredentialCipher::encrypt(QStringLiteral("masterkey")));
-        }
     }
-    ~AppTestEnv()
-    {
-        m_window.reset();
-        m_dm.reset();
-        setProgramFolder(QString());
-        qunsetenv("VARNIK_HKLM");
-    }
+    ~AppTestEnv() { m_window.reset(); }
     AppTestEnv(const AppTestEnv&) = delete;
     AppTestEnv& operator=(const AppTestEnv&) = delete;
 
-    TempDatabase& db() { return m_db; }
-    TDM2& dm()
-    {
-        if (!m_dm)
-            m_dm = std::make_unique<TDM2>();
-        return *m_dm;
-    }
-    ScriptedDialogService& dialogs() { return m_dialogs.service(); }
-    [[nodiscard]] QString folder() const { return m_dir.path(); }
-    [[nodiscard]] QString runtimeFolder() const { return m_runtime.path(); }
-    [[nodiscard]] QString file(const QString& name) const { return m_dir.filePath(name); }
-    void writeFile(const QString& name, const QByteArray& bytes) const
-    {
-        QFile f(file(name));
-        if (f.open(QIODevice::WriteOnly | QIODevice::Truncate))
-            f.write(bytes);
-    }
-    [[nodiscard]] QByteArray readFile(const QString& name) const
-    {
-        QFile f(file(name));
-        return f.open(QIODevice::ReadOnly) ? f.readAll() : QByteArray();
-    }
+    TempDatabase& db() { return m_env.db(); }
+    TDM2& dm() { return m_env.dm(); }
+    ScriptedDialogService& dialogs() { return m_env.dialogs(); }
+    [[nodiscard]] QString folder() const { return m_env.folder(); }
+    [[nodiscard]] QString runtimeFolder() const { return m_runtime.dir.path(); }
+    [[nodiscard]] QString file(const QString& name) const { return m_env.file(name); }
+    void writeFile(const QString& name, const QByteArray& bytes) const { (void)m_env.writeFile(name, bytes); }
+    [[nodiscard]] QByteArray readFile(const QString& name) const { return m_env.readFile(name); }
 
     void addCall(int lid, const QString& date, const QString& fromphone, const QString& frombez = QString())
     {
-        m_db.exec(QStringLiteral("INSERT INTO LOG (LID, TSDATE, TSTIME, FROMBEZ, FROMPHONE, CTYPE, SERVICE, STATUS) "
+        db().exec(QStringLiteral("INSERT INTO LOG (LID, TSDATE, TSTIME, FROMBEZ, FROMPHONE, CTYPE, SERVICE, STATUS) "
                                  "VALUES (%1, '%2', '10:00:00', '%3', '%4', 0, 1, 'angenommen')")
                       .arg(lid)
                       .arg(date, frombez, fromphone));
@@ -95,12 +62,14 @@ public:
     void destroyWindow() { m_window.reset(); }
 
 private:
-    QTemporaryDir m_dir;
-    QTemporaryDir m_runtime;
-    ScopedFixedClock m_clock;
-    ScopedScriptedDialogs m_dialogs;
-    TempDatabase m_db;
-    std::unique_ptr<TDM2> m_dm;
+    // Mutexes and message sockets go to a private folder, set before anything else starts.
+    struct RuntimeFolder {
+        RuntimeFolder() { qputenv("XDG_RUNTIME_DIR", dir.path().toLocal8Bit()); }
+        QTemporaryDir dir;
+    };
+
+    RuntimeFolder m_runtime;
+    ProgramTestEnv m_env;
     std::unique_ptr<TLogform> m_window;
 };
 

@@ -4,21 +4,14 @@
 // temporary folder, scripted dialogs, a fixed clock, and a host that records posted messages.
 
 #include "db/CredentialCipher.h"
-#include "db/TDM2.h"
-#include "platform/Clock.h"
-#include "platform/ErrorLog.h"
 #include "platform/ProgramFolder.h"
 #include "platform/Registry.h"
 #include "platform/WindowMessages.h"
-#include "tests/support/ScriptedDialogService.h"
-#include "tests/support/TempDatabase.h"
+#include "tests/support/ProgramTestEnv.h"
 
 #include <QCoreApplication>
 #include <QFile>
-#include <QTemporaryDir>
 #include <QTest>
-
-#include <memory>
 
 namespace orvanta::test {
 
@@ -58,51 +51,22 @@ public:
     static QDate today() { return {2024, 5, 15}; }
 
     LogTestEnv()
-        : m_clock(QDateTime(today(), QTime(12, 0)))
+        : m_env(QDateTime(today(), QTime(12, 0)), ProgramTestEnv::ErrorLogSetup::Create)
     {
-        qputenv("VARNIK_HKLM", m_dir.filePath(QStringLiteral("hklm.ini")).toLocal8Bit());
-        setProgramFolder(m_dir.path());
-        m_log = std::make_unique<TvkErrorLog>(m_dir.path(), 20, QStringLiteral("OXError.log"));
-        setErrorLog(m_log.get());
-        Registry r(RegistryRoot::LocalMachine);
-        if (r.openKey(QStringLiteral("Software\\Varnik\\Rufwarte"), true)) {
-            r.writeString(QStringLiteral("Database"), m_db.path());
-            r.writeString(QStringLiteral("Username"), CredentialCipher::encrypt(QStringLiteral("SYSDBA")));
-            r.writeString(QStringLiteral("Password"), CredentialCipher::encrypt(QStringLiteral("masterkey")));
-        }
     }
-    ~LogTestEnv()
-    {
-        m_dm.reset();
-        setErrorLog(nullptr);
-        setProgramFolder(QString());
-        qunsetenv("VARNIK_HKLM");
-    }
-    LogTestEnv(const LogTestEnv&) = delete;
-    LogTestEnv& operator=(const LogTestEnv&) = delete;
 
-    TempDatabase& db() { return m_db; }
+    TempDatabase& db() { return m_env.db(); }
     // The data module, connected on first use (after the test has filled the database).
-    TDM2& dm()
-    {
-        if (!m_dm)
-            m_dm = std::make_unique<TDM2>();
-        return *m_dm;
-    }
-    ScriptedDialogService& dialogs() { return m_dialogs.service(); }
+    TDM2& dm() { return m_env.dm(); }
+    ScriptedDialogService& dialogs() { return m_env.dialogs(); }
     MessageRecorder& host() { return m_host; }
-    QString folder() const { return m_dir.path(); }
-    QString file(const QString& name) const { return m_dir.filePath(name); }
-    void writeFile(const QString& name, const QByteArray& bytes) const
-    {
-        QFile f(file(name));
-        QVERIFY(f.open(QIODevice::WriteOnly | QIODevice::Truncate));
-        f.write(bytes);
-    }
+    QString folder() const { return m_env.folder(); }
+    QString file(const QString& name) const { return m_env.file(name); }
+    void writeFile(const QString& name, const QByteArray& bytes) const { QVERIFY(m_env.writeFile(name, bytes)); }
     // The error log's file as text (Windows-1252 is Latin-1 for these texts).
     QString errorLogText() const
     {
-        QFile f(m_log->filePath());
+        QFile f(m_env.errorLog()->filePath());
         return f.open(QIODevice::ReadOnly) ? QString::fromLatin1(f.readAll()) : QString();
     }
 
@@ -111,7 +75,7 @@ public:
                  int ctype = 0, const QString& service = QStringLiteral("1"), int abid = 0,
                  const QString& onbez = QStringLiteral("'Büro'"), const QString& onmsn = QStringLiteral("'4711'"))
     {
-        m_db.exec(QStringLiteral("INSERT INTO LOG (LID, TSDATE, TSTIME, TS, FROMBEZ, FROMPHONE, CTYPE, SERVICE, ABID, "
+        db().exec(QStringLiteral("INSERT INTO LOG (LID, TSDATE, TSTIME, TS, FROMBEZ, FROMPHONE, CTYPE, SERVICE, ABID, "
                                  "ONBEZ, ONMSN, STATUS, REGION, CCHARGE, CTIME) VALUES (%1, %2, %3, NULL, %4, %5, %6, "
                                  "%7, %8, %9, %10, 'angenommen', 'Berlin', 1.5, '00:01:30')")
                       .arg(lid)
@@ -123,12 +87,7 @@ public:
     }
 
 private:
-    QTemporaryDir m_dir;
-    ScopedFixedClock m_clock;
-    ScopedScriptedDialogs m_dialogs;
-    TempDatabase m_db;
-    std::unique_ptr<TvkErrorLog> m_log;
-    std::unique_ptr<TDM2> m_dm;
+    ProgramTestEnv m_env;
     MessageRecorder m_host;
 };
 
