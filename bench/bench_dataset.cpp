@@ -5,14 +5,7 @@
 //
 //   bench_dataset [--max ROWS] [--runs N] [--dir FOLDER]
 
-#include "db/CredentialCipher.h"
-#include "db/FbAttachment.h"
-#include "db/FbStatement.h"
-#include "db/FbTransaction.h"
-#include "db/Schema.h"
-#include "db/SqlScript.h"
-#include "db/TDM2.h"
-#include "platform/Registry.h"
+#include "bench/BenchSupport.h"
 
 #include <QCoreApplication>
 #include <QElapsedTimer>
@@ -23,6 +16,7 @@
 #include <random>
 
 using namespace orvanta;
+using namespace orvanta::bench;
 
 namespace {
 
@@ -107,81 +101,6 @@ void fill(FbAttachment& db, int rows)
     tx.commit();
 }
 
-struct RawResult {
-    qint64 rows = 0;
-    qint64 valueBytes = 0;
-    quint64 checksum = 0;
-};
-
-// Reads every value of every row from the fetch buffer: fixed values by their width, text by all
-// of its bytes. Nothing is kept.
-RawResult rawFetch(FbAttachment& db, FbTransaction& tx)
-{
-    RawResult r;
-    if (tx.isActive())
-        tx.rollback();
-    tx.start();
-    FbStatement st(db, &tx, QStringLiteral("SELECT * FROM LOG"));
-    st.execute();
-    const int n = st.columnCount();
-    while (st.next()) {
-        const unsigned char* row = st.rowData();
-        for (int i = 0; i < n; ++i) {
-            const FbSlot& s = st.slot(i);
-            short null;
-            std::memcpy(&null, row + s.nullOffset, sizeof null);
-            if (null)
-                continue;
-            const unsigned char* v = row + s.offset;
-            switch (s.storage) {
-            case FbSlot::Storage::VarText: {
-                quint16 len;
-                std::memcpy(&len, v, 2);
-                for (quint16 k = 0; k < len; ++k)
-                    r.checksum = r.checksum * 31 + v[2 + k];
-                r.valueBytes += len;
-                break;
-            }
-            case FbSlot::Storage::Text: {
-                int len = s.length;
-                while (len > 0 && v[len - 1] == ' ')
-                    --len;
-                for (int k = 0; k < len; ++k)
-                    r.checksum = r.checksum * 31 + v[k];
-                r.valueBytes += len;
-                break;
-            }
-            case FbSlot::Storage::I16: {
-                qint16 x;
-                std::memcpy(&x, v, 2);
-                r.checksum += quint64(x);
-                r.valueBytes += 2;
-                break;
-            }
-            case FbSlot::Storage::I64:
-            case FbSlot::Storage::F64:
-            case FbSlot::Storage::Timestamp: {
-                quint64 x;
-                std::memcpy(&x, v, 8);
-                r.checksum += x;
-                r.valueBytes += 8;
-                break;
-            }
-            default: {
-                quint32 x;
-                std::memcpy(&x, v, 4);
-                r.checksum += x;
-                r.valueBytes += 4;
-                break;
-            }
-            }
-        }
-        ++r.rows;
-    }
-    tx.commit();
-    return r;
-}
-
 int usage()
 {
     std::fprintf(stderr, "usage: bench_dataset [--max ROWS] [--runs N] [--dir FOLDER]\n");
@@ -211,8 +130,7 @@ int main(int argc, char* argv[])
             return usage();
     }
 
-    QTemporaryDir tmp(folder.isEmpty() ? QDir::tempPath() + QStringLiteral("/bench_dataset-XXXXXX")
-                                       : folder + QStringLiteral("/bench_dataset-XXXXXX"));
+    QTemporaryDir tmp(tempFolderPattern(folder, "bench_dataset"));
     if (!tmp.isValid()) {
         std::fprintf(stderr, "cannot create a temporary folder\n");
         return 1;
@@ -227,21 +145,13 @@ int main(int argc, char* argv[])
             break;
         const QString path = tmp.filePath(QStringLiteral("log-%1.fdb").arg(rows));
         try {
-            FbAttachment::createDatabase(path, QStringLiteral("SYSDBA"), QStringLiteral("masterkey"), 8192, false);
-            {
-                FbAttachment db;
-                db.attach(path, QStringLiteral("SYSDBA"), QStringLiteral("masterkey"));
-                SqlScript::run(db, schemaScript());
+            createLogDatabase(path, [rows](FbAttachment& db) {
                 QElapsedTimer fillTimer;
                 fillTimer.start();
                 fill(db, rows);
                 std::fprintf(stderr, "filled %d rows in %.1f s\n", rows, double(fillTimer.elapsed()) / 1000.0);
-            }
-            Registry registry(RegistryRoot::LocalMachine);
-            registry.openKey(QString::fromLatin1(TDM2::kRegistryKey), true);
-            registry.writeString(QStringLiteral("Database"), path);
-            registry.writeString(QStringLiteral("Username"), CredentialCipher::encrypt(QStringLiteral("SYSDBA")));
-            registry.writeString(QStringLiteral("Password"), CredentialCipher::encrypt(QStringLiteral("masterkey")));
+            });
+            pointDataModuleAt(path);
 
             TDM2 dm;
             if (!dm.IBDatabase1.isConnected()) {

@@ -13,16 +13,9 @@
 //
 //   bench_loglist [--max N] [--dir FOLDER]      sizes 10 000, 100 000 and 1 000 000 up to N
 
+#include "bench/BenchSupport.h"
 #include "calllog/Tlogframe.h"
-#include "db/CredentialCipher.h"
-#include "db/FbAttachment.h"
-#include "db/FbStatement.h"
-#include "db/FbTransaction.h"
-#include "db/Schema.h"
-#include "db/SqlScript.h"
-#include "db/TDM2.h"
 #include "platform/ProgramFolder.h"
-#include "platform/Registry.h"
 #include "platform/WindowMessages.h"
 #include "tools/demo/DemoData.h"
 #include "ui/grid/GridController.h"
@@ -38,6 +31,7 @@
 #include <cstring>
 
 using namespace orvanta;
+using namespace orvanta::bench;
 
 namespace {
 
@@ -56,57 +50,6 @@ protected:
         }
     }
 };
-
-// Every value of every row read from the fetch buffer; nothing kept.
-quint64 rawFetch(FbAttachment& db, FbTransaction& tx)
-{
-    quint64 checksum = 0;
-    if (tx.isActive())
-        tx.rollback();
-    tx.start();
-    FbStatement st(db, &tx, QStringLiteral("SELECT * FROM LOG"));
-    st.execute();
-    const int n = st.columnCount();
-    while (st.next()) {
-        const unsigned char* row = st.rowData();
-        for (int i = 0; i < n; ++i) {
-            const FbSlot& s = st.slot(i);
-            short null;
-            std::memcpy(&null, row + s.nullOffset, sizeof null);
-            if (null)
-                continue;
-            const unsigned char* v = row + s.offset;
-            int len = 0;
-            switch (s.storage) {
-            case FbSlot::Storage::VarText: {
-                quint16 l;
-                std::memcpy(&l, v, 2);
-                len = l;
-                v += 2;
-                break;
-            }
-            case FbSlot::Storage::Text:
-                len = s.length;
-                break;
-            case FbSlot::Storage::I16:
-                len = 2;
-                break;
-            case FbSlot::Storage::I64:
-            case FbSlot::Storage::F64:
-            case FbSlot::Storage::Timestamp:
-                len = 8;
-                break;
-            default:
-                len = 4;
-                break;
-            }
-            for (int k = 0; k < len; ++k)
-                checksum = checksum * 31 + v[k];
-        }
-    }
-    tx.commit();
-    return checksum;
-}
 
 qint64 residentKiB()
 {
@@ -159,8 +102,7 @@ int main(int argc, char* argv[])
             return usage();
         }
     }
-    QTemporaryDir temp(folder.isEmpty() ? QDir::tempPath() + QStringLiteral("/bench_loglist-XXXXXX")
-                                        : folder + QStringLiteral("/bench_loglist-XXXXXX"));
+    QTemporaryDir temp(tempFolderPattern(folder, "bench_loglist"));
     if (!temp.isValid()) {
         std::fprintf(stderr, "no temporary folder\n");
         return 1;
@@ -178,19 +120,9 @@ int main(int argc, char* argv[])
             break;
         const QString path = temp.filePath(QStringLiteral("log%1.fdb").arg(calls));
         try {
-            FbAttachment::createDatabase(path, QStringLiteral("SYSDBA"), QStringLiteral("masterkey"), 8192, false);
-            {
-                FbAttachment db;
-                db.attach(path, QStringLiteral("SYSDBA"), QStringLiteral("masterkey"));
-                SqlScript::run(db, schemaScript());
-                demo::generateCalls(db, calls, 4711, lastDay);
-                db.disconnect();
-            }
-            Registry registry(RegistryRoot::LocalMachine);
-            registry.openKey(QString::fromLatin1(TDM2::kRegistryKey), true);
-            registry.writeString(QStringLiteral("Database"), path);
-            registry.writeString(QStringLiteral("Username"), CredentialCipher::encrypt(QStringLiteral("SYSDBA")));
-            registry.writeString(QStringLiteral("Password"), CredentialCipher::encrypt(QStringLiteral("masterkey")));
+            createLogDatabase(path,
+                              [calls, &lastDay](FbAttachment& db) { demo::generateCalls(db, calls, 4711, lastDay); });
+            pointDataModuleAt(path);
 
             TDM2 dm;
             if (!dm.IBDatabase1.isConnected()) {

@@ -1,0 +1,124 @@
+#pragma once
+// What the database benchmarks share: a log database in a temporary folder that the data module
+// finds through the registry as at a real start, and the baseline every ratio is measured
+// against, a raw fetch of "SELECT * FROM LOG".
+
+#include "db/CredentialCipher.h"
+#include "db/FbAttachment.h"
+#include "db/FbStatement.h"
+#include "db/FbTransaction.h"
+#include "db/Schema.h"
+#include "db/SqlScript.h"
+#include "db/TDM2.h"
+#include "platform/Registry.h"
+
+#include <QDir>
+#include <QString>
+
+#include <cstring>
+
+namespace orvanta::bench {
+
+// The name pattern of the run's temporary folder, under 'folder' or the system's.
+inline QString tempFolderPattern(const QString& folder, const char* program)
+{
+    return (folder.isEmpty() ? QDir::tempPath() : folder) + QLatin1Char('/') + QLatin1String(program)
+        + QStringLiteral("-XXXXXX");
+}
+
+// A new database with the program's schema, filled by 'fill' and closed again.
+template <typename Fill>
+void createLogDatabase(const QString& path, Fill&& fill)
+{
+    FbAttachment::createDatabase(path, QStringLiteral("SYSDBA"), QStringLiteral("masterkey"), 8192, false);
+    FbAttachment db;
+    db.attach(path, QStringLiteral("SYSDBA"), QStringLiteral("masterkey"));
+    SqlScript::run(db, schemaScript());
+    fill(db);
+    db.disconnect();
+}
+
+// Points the registry (VARNIK_HKLM must be set) at the database the next data module opens.
+inline void pointDataModuleAt(const QString& path)
+{
+    Registry registry(RegistryRoot::LocalMachine);
+    registry.openKey(QString::fromLatin1(TDM2::kRegistryKey), true);
+    registry.writeString(QStringLiteral("Database"), path);
+    registry.writeString(QStringLiteral("Username"), CredentialCipher::encrypt(QStringLiteral("SYSDBA")));
+    registry.writeString(QStringLiteral("Password"), CredentialCipher::encrypt(QStringLiteral("masterkey")));
+}
+
+struct RawResult {
+    qint64 rows = 0;
+    qint64 valueBytes = 0;
+    quint64 checksum = 0;
+};
+
+// Reads every value of every row from the fetch buffer: fixed values by their width, text by all
+// of its bytes. Nothing is kept.
+inline RawResult rawFetch(FbAttachment& db, FbTransaction& tx)
+{
+    RawResult r;
+    TDM2::restart(tx);
+    FbStatement st(db, &tx, QStringLiteral("SELECT * FROM LOG"));
+    st.execute();
+    const int n = st.columnCount();
+    while (st.next()) {
+        const unsigned char* row = st.rowData();
+        for (int i = 0; i < n; ++i) {
+            const FbSlot& s = st.slot(i);
+            short null;
+            std::memcpy(&null, row + s.nullOffset, sizeof null);
+            if (null)
+                continue;
+            const unsigned char* v = row + s.offset;
+            switch (s.storage) {
+            case FbSlot::Storage::VarText: {
+                quint16 len;
+                std::memcpy(&len, v, 2);
+                for (quint16 k = 0; k < len; ++k)
+                    r.checksum = r.checksum * 31 + v[2 + k];
+                r.valueBytes += len;
+                break;
+            }
+            case FbSlot::Storage::Text: {
+                int len = s.length;
+                while (len > 0 && v[len - 1] == ' ')
+                    --len;
+                for (int k = 0; k < len; ++k)
+                    r.checksum = r.checksum * 31 + v[k];
+                r.valueBytes += len;
+                break;
+            }
+            case FbSlot::Storage::I16: {
+                qint16 x;
+                std::memcpy(&x, v, 2);
+                r.checksum += quint64(x);
+                r.valueBytes += 2;
+                break;
+            }
+            case FbSlot::Storage::I64:
+            case FbSlot::Storage::F64:
+            case FbSlot::Storage::Timestamp: {
+                quint64 x;
+                std::memcpy(&x, v, 8);
+                r.checksum += x;
+                r.valueBytes += 8;
+                break;
+            }
+            default: {
+                quint32 x;
+                std::memcpy(&x, v, 4);
+                r.checksum += x;
+                r.valueBytes += 4;
+                break;
+            }
+            }
+        }
+        ++r.rows;
+    }
+    tx.commit();
+    return r;
+}
+
+} // namespace orvanta::bench
