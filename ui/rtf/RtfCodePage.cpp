@@ -1,5 +1,7 @@
 #include "ui/rtf/RtfCodePage.h"
 
+#include "platform/Windows1252.h"
+
 #include <QStringDecoder>
 #include <array>
 
@@ -43,13 +45,6 @@ constexpr char16_t kCp1251[128] = {
     0x0438, 0x0439, 0x043A, 0x043B, 0x043C, 0x043D, 0x043E, 0x043F,
     0x0440, 0x0441, 0x0442, 0x0443, 0x0444, 0x0445, 0x0446, 0x0447,
     0x0448, 0x0449, 0x044A, 0x044B, 0x044C, 0x044D, 0x044E, 0x044F,
-};
-// 0xA0..0xFF equal Latin-1.
-constexpr char16_t kCp1252[32] = {
-    0x20AC, 0x0081, 0x201A, 0x0192, 0x201E, 0x2026, 0x2020, 0x2021,
-    0x02C6, 0x2030, 0x0160, 0x2039, 0x0152, 0x008D, 0x017D, 0x008F,
-    0x0090, 0x2018, 0x2019, 0x201C, 0x201D, 0x2022, 0x2013, 0x2014,
-    0x02DC, 0x2122, 0x0161, 0x203A, 0x0153, 0x009D, 0x017E, 0x0178,
 };
 
 // Names to try with QStringDecoder for the code pages we do not carry ourselves.
@@ -127,7 +122,7 @@ char16_t RtfCodePage::builtIn(int codePage, unsigned char byte)
     switch (codePage) {
     case 1250: return kCp1250[byte - 0x80];
     case 1251: return kCp1251[byte - 0x80];
-    default: return byte < 0xA0 ? kCp1252[byte - 0x80] : char16_t(byte);
+    default: return fromWindows1252(QByteArrayView(reinterpret_cast<const char*>(&byte), 1)).at(0).unicode();
     }
 }
 
@@ -161,6 +156,10 @@ void RtfCodePage::decode(const QByteArray& bytes, int codePage, QString& out)
             return;
         }
         codePage = 1252;
+    }
+    if (codePage == 1252) {
+        out += fromWindows1252(bytes);
+        return;
     }
     out.reserve(out.size() + bytes.size());
     for (char c : bytes)
