@@ -27,6 +27,16 @@ bool connected(TDM2* dm)
     return dm->DBConnect();
 }
 
+// A failed operation leaves nothing open or half-done behind and says what went wrong.
+template <typename Query>
+bool abandon(Query& query, FbTransaction& tx, const QString& failure, const std::exception& e)
+{
+    query.close();
+    tx.rollbackQuietly();
+    reportError(failure, &e);
+    return false;
+}
+
 // Keeps the calendar from repainting while its marks change.
 class FrozenCalendar final {
 public:
@@ -92,12 +102,10 @@ bool LogMaintenance::gettinglogdates(PlannerCalendar& calendar)
         TDM2::commitIfActive(tx);
         return true;
     } catch (const std::exception& e) {
-        query.close();
-        tx.rollbackQuietly();
-        reportError(QStringLiteral("# Orvanta - gettinglogdates\r\nTabelle konnte nicht geöffnet werden!\r\n"
-                                   "Vorhandene Protokolleinträge konnten nicht ermittelt werden."),
-                    &e);
-        return false;
+        return abandon(query, tx,
+                       QStringLiteral("# Orvanta - gettinglogdates\r\nTabelle konnte nicht geöffnet werden!\r\n"
+                                      "Vorhandene Protokolleinträge konnten nicht ermittelt werden."),
+                       e);
     }
 }
 
@@ -155,10 +163,7 @@ bool LogMaintenance::deleteWhere(const QString& sql, const QString& param, const
         tx.commit();
         return true;
     } catch (const std::exception& e) {
-        query.close();
-        tx.rollbackQuietly();
-        reportError(label, &e);
-        return false;
+        return abandon(query, tx, label, e);
     }
 }
 
@@ -235,9 +240,7 @@ int LogMaintenance::CheckOfNumber(const QString& number)
         sql.close();
         tx.commit();
     } catch (const std::exception& e) {
-        sql.close();
-        tx.rollbackQuietly();
-        reportError(failure, &e);
+        abandon(sql, tx, failure, e);
         return 2;
     }
     if (key <= 0)
@@ -272,10 +275,7 @@ bool LogMaintenance::LogCheckOfNumber(const QString& number)
         tx.commit();
         return found;
     } catch (const std::exception& e) {
-        sql.close();
-        tx.rollbackQuietly();
-        reportError(QStringLiteral("# Orvanta - LogCheckOfNumber"), &e);
-        return false;
+        return abandon(sql, tx, QStringLiteral("# Orvanta - LogCheckOfNumber"), e);
     }
 }
 
