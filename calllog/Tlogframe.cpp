@@ -219,6 +219,9 @@ void Tlogframe::buildLayout()
     m_searchPanel->setObjectName(QStringLiteral("RzPanel1"));
     auto* sp = new QHBoxLayout(m_searchPanel);
     sp->setContentsMargins(4, 2, 4, 2);
+    // Collapsed, the panel must not dictate the frame's width: the log list has to fit narrow windows.
+    sp->setSizeConstraint(QLayout::SetNoConstraint);
+    m_searchPanel->setSizePolicy(QSizePolicy::Ignored, QSizePolicy::Fixed);
     auto* l1 = new QLabel(QStringLiteral("Suchen nach:"), m_searchPanel);
     m_cxTE1 = new QLineEdit(m_searchPanel);
     m_cxTE1->setObjectName(QStringLiteral("cxTE1"));
