@@ -25,6 +25,7 @@
 #include <QLabel>
 #include <QMenuBar>
 #include <QRadioButton>
+#include <QScreen>
 #include <QSplitter>
 #include <QTextEdit>
 #include <QTimer>
@@ -55,7 +56,13 @@ TLogform::TLogform(TDM2* dm, const QStringList& parameters, MainWindowFactories 
     setObjectName(QStringLiteral("TLogform"));
     setWindowTitle(QStringLiteral("Orvanta"));
     setMinimumSize(730, 530);
-    resize(922, 640);
+    // The log's columns need room: take most of the screen, never less than the classic size.
+    QSize size(922, 640);
+    if (const QScreen* screen = QGuiApplication::primaryScreen()) {
+        const QSize avail = screen->availableGeometry().size();
+        size = size.expandedTo(avail * 0.85).boundedTo(avail.expandedTo(minimumSize()));
+    }
+    resize(size);
 
     m_maintenance = std::make_unique<LogMaintenance>(dm);
     m_monitor = std::make_unique<MonitorLink>(this);
