@@ -1,11 +1,12 @@
 #include "app/Startup.h"
 
 #include "app/MainWindowFactories.h"
-#include "app/SharedEngine.h"
+#include "db/SharedEngine.h"
 #include "app/TLogform.h"
 #include "calllog/LogMaintenance.h"
 #include "db/TDM2.h"
 #include "platform/NamedMutex.h"
+#include "ui/dialogs/MessageBoxDialogService.h"
 
 #include <QApplication>
 
@@ -34,6 +35,8 @@ int Startup::run(int argc, char* argv[])
     QApplication::setApplicationName(QStringLiteral("Varnik Orvanta"));
     QApplication::setApplicationDisplayName(QStringLiteral("Varnik Orvanta"));
     QApplication::setApplicationVersion(QStringLiteral(ORVANTA_VERSION));
+    MessageBoxDialogService messageBoxes;
+    setDialogService(&messageBoxes);
     int code = 0;
     {
         TDM2 dm;
@@ -46,6 +49,7 @@ int Startup::run(int argc, char* argv[])
         }
         // The data module closes its data sets and the connection here.
     }
+    setDialogService(nullptr);
     instance.reset();
     return code;
 }

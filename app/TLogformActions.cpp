@@ -3,7 +3,7 @@
 #include "app/TLogform.h"
 
 #include "app/AppServices.h"
-#include "app/MonitorLink.h"
+#include "platform/MonitorLink.h"
 #include "app/ProgramLauncher.h"
 #include "calllog/LogMaintenance.h"
 #include "db/TDM2.h"

@@ -6,7 +6,7 @@
 #include "calllog/LogMaintenance.h"
 #include "phone/TvkMiniKontakt.h"
 #include "platform/AppException.h"
-#include "platform/BusyCursor.h"
+#include "ui/dialogs/BusyCursor.h"
 #include "platform/ErrorLog.h"
 #include "platform/WindowMessages.h"
 #include "ui/frames/ContactListFrame.h"

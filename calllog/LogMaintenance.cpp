@@ -3,7 +3,7 @@
 #include "db/FbStatement.h"
 #include "db/FbTransaction.h"
 #include "db/TDM2.h"
-#include "platform/BusyCursor.h"
+#include "ui/dialogs/BusyCursor.h"
 #include "platform/Clock.h"
 #include "platform/DialogService.h"
 #include "platform/ErrorLog.h"

@@ -2,7 +2,7 @@
 
 #include "db/TDM2.h"
 #include "phone/PhoneNumbers.h"
-#include "platform/BusyCursor.h"
+#include "ui/dialogs/BusyCursor.h"
 #include "platform/DialogService.h"
 #include "platform/ErrorLog.h"
 #include "platform/WindowMessages.h"

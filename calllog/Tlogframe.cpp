@@ -5,7 +5,7 @@
 #include "db/TDM2.h"
 #include "phone/PhoneNumbers.h"
 #include "platform/AppException.h"
-#include "platform/BusyCursor.h"
+#include "ui/dialogs/BusyCursor.h"
 #include "platform/Clock.h"
 #include "platform/ErrorLog.h"
 #include "platform/ProgramFolder.h"

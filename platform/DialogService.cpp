@@ -1,30 +1,27 @@
 #include "platform/DialogService.h"
 
-#include <QApplication>
-#include <QMessageBox>
-#include <QPushButton>
+#include <cstdio>
 
 namespace orvanta {
 namespace {
 
 DialogService* g_installed = nullptr;
 
-QMessageBox::Icon iconOf(DialogKind kind)
-{
-    switch (kind) {
-    case DialogKind::Error:
-        return QMessageBox::Critical;
-    case DialogKind::Warning:
-        return QMessageBox::Warning;
-    case DialogKind::Information:
-        return QMessageBox::Information;
-    case DialogKind::Question:
-        return QMessageBox::Question;
+// Nobody to ask (no window system, or no service installed yet): the text goes to the
+// standard error so it is not lost, and the answer is the one closing the box gives.
+class ConsoleDialogService final : public DialogService {
+public:
+    DialogButton show(DialogKind kind, const QString& title, const QString& text, DialogButtons buttons,
+                      DialogButton) override
+    {
+        std::fprintf(stderr, "%s: %s\n", qPrintable(title.isEmpty() ? defaultTitle(kind) : title), qPrintable(text));
+        return escapeAnswer(buttons == DialogButton::NoButton ? DialogButtons(DialogButton::Ok) : buttons);
     }
-    return QMessageBox::NoIcon;
-}
+};
 
-DialogButton escapeAnswer(DialogButtons buttons)
+} // namespace
+
+DialogButton DialogService::escapeAnswer(DialogButtons buttons)
 {
     if (buttons.testFlag(DialogButton::Cancel))
         return DialogButton::Cancel;
@@ -32,8 +29,6 @@ DialogButton escapeAnswer(DialogButtons buttons)
         return DialogButton::No;
     return DialogButton::Ok;
 }
-
-} // namespace
 
 void DialogService::error(const QString& text, const QString& title)
 {
@@ -71,56 +66,10 @@ QString DialogService::defaultTitle(DialogKind kind)
     return {};
 }
 
-DialogButton MessageBoxDialogService::show(DialogKind kind, const QString& title, const QString& text,
-                                           DialogButtons buttons, DialogButton defaultButton)
-{
-    if (buttons == DialogButton::NoButton)
-        buttons = DialogButton::Ok;
-    if (qobject_cast<QApplication*>(QCoreApplication::instance()) == nullptr)
-        return escapeAnswer(buttons);
-
-    // Messages carry Windows line ends; a lone CR would show as a glyph.
-    QString shown = text;
-    shown.replace(QStringLiteral("\r\n"), QStringLiteral("\n")).replace(u'\r', u'\n');
-
-    QMessageBox box(iconOf(kind), title.isEmpty() ? defaultTitle(kind) : title, shown, QMessageBox::NoButton,
-                    QApplication::activeWindow());
-    struct Choice {
-        DialogButton button;
-        const char* text;
-        QMessageBox::ButtonRole role;
-    };
-    const Choice choices[] = {
-        {DialogButton::Ok, "OK", QMessageBox::AcceptRole},
-        {DialogButton::Yes, "Ja", QMessageBox::YesRole},
-        {DialogButton::No, "Nein", QMessageBox::NoRole},
-        {DialogButton::Cancel, "Abbrechen", QMessageBox::RejectRole},
-    };
-    QList<QPair<QAbstractButton*, DialogButton>> made;
-    for (const Choice& choice : choices) {
-        if (!buttons.testFlag(choice.button))
-            continue;
-        QPushButton* button = box.addButton(QString::fromLatin1(choice.text), choice.role);
-        made.append({button, choice.button});
-        if (choice.button == defaultButton)
-            box.setDefaultButton(button);
-    }
-    for (const auto& [button, value] : made) {
-        if (value == escapeAnswer(buttons))
-            box.setEscapeButton(button);
-    }
-    box.exec();
-    for (const auto& [button, value] : made) {
-        if (box.clickedButton() == button)
-            return value;
-    }
-    return escapeAnswer(buttons);
-}
-
 DialogService& dialogs()
 {
-    static MessageBoxDialogService messageBoxes;
-    return g_installed != nullptr ? *g_installed : messageBoxes;
+    static ConsoleDialogService console;
+    return g_installed != nullptr ? *g_installed : console;
 }
 
 DialogService* setDialogService(DialogService* service)

@@ -1,7 +1,8 @@
 #pragma once
-// Every message box of the program goes through one dialog service. The real one shows a modal
-// QMessageBox with German buttons; tests install a scripted one that records each dialog and
-// answers as the test wants, so no dialog ever blocks a test.
+// Every message box of the program goes through one dialog service. The program installs the
+// message boxes of ui/dialogs at start-up; tests install a scripted one that records each dialog
+// and answers as the test wants, so no dialog ever blocks a test. Without one installed, texts go
+// to the standard error (command-line tools, early start-up).
 
 #include <QFlags>
 #include <QString>
@@ -37,19 +38,14 @@ public:
 
     // "Fehler", "Warnung", "Information", "Bestätigen".
     [[nodiscard]] static QString defaultTitle(DialogKind kind);
+    // What closing the dialog without a click answers: Cancel when offered, else No, else Ok.
+    [[nodiscard]] static DialogButton escapeAnswer(DialogButtons buttons);
 };
 
-// Shows QMessageBox dialogs over the active window.
-class MessageBoxDialogService final : public DialogService {
-public:
-    DialogButton show(DialogKind kind, const QString& title, const QString& text, DialogButtons buttons,
-                      DialogButton defaultButton) override;
-};
-
-// The process-wide service; the message-box one unless a test installed another.
+// The process-wide service: the installed one, else the standard-error one.
 [[nodiscard]] DialogService& dialogs();
 // Installs a service (not owned; the caller keeps it alive while installed); nullptr restores
-// the message-box one. Returns the one installed before.
+// the standard-error one. Returns the one installed before.
 DialogService* setDialogService(DialogService* service);
 
 } // namespace orvanta

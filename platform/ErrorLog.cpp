@@ -1,7 +1,7 @@
 #include "platform/ErrorLog.h"
 
 #include "platform/AppException.h"
-#include "platform/BusyCursor.h"
+#include "platform/BusyReset.h"
 #include "platform/Clock.h"
 #include "platform/DialogService.h"
 #include "platform/Windows1252.h"
@@ -154,7 +154,7 @@ void TvkErrorLog::LogWarning(const QString& message, const std::exception* e)
 
 void TvkErrorLog::ShowError(const QString& message, const std::exception* e)
 {
-    BusyCursor::resetCursor();
+    resetBusyIndicator();
     LogError(message, e);
     QString text = message;
     if (e != nullptr)
@@ -164,7 +164,7 @@ void TvkErrorLog::ShowError(const QString& message, const std::exception* e)
 
 void TvkErrorLog::ShowWarning(const QString& message, const std::exception* e)
 {
-    BusyCursor::resetCursor();
+    resetBusyIndicator();
     LogWarning(message, e);
     QString text = message;
     if (e != nullptr)

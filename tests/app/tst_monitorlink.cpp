@@ -1,6 +1,7 @@
 #include "app/MainWindowFactories.h"
-#include "app/MonitorLink.h"
-#include "app/SharedEngine.h"
+#include "platform/MonitorLink.h"
+#include "tests/support/MessageReceiver.h"
+#include "db/SharedEngine.h"
 #include "app/TLogform.h"
 #include "tests/TestPaths.h"
 #include "tests/app/AppTestEnv.h"
@@ -18,27 +19,7 @@ using orvanta::test::AppTestEnv;
 
 namespace {
 
-// Records the window messages it receives and whether each came at once or from the queue.
-class Receiver final : public QObject {
-public:
-    struct Got {
-        int message;
-        qintptr wParam;
-        bool posted;
-    };
-    QList<Got> got;
-    bool delivering = false;
-
-protected:
-    bool event(QEvent* e) override
-    {
-        if (WindowMessageEvent* m = asWindowMessage(e)) {
-            got.append({m->message(), m->wParam(), !delivering});
-            return true;
-        }
-        return QObject::event(e);
-    }
-};
+using Receiver = orvanta::test::MessageReceiver;
 
 QString rufwarteProgram()
 {
@@ -128,8 +109,7 @@ private Q_SLOTS:
 
     void aRunningStandInMonitorTalksToTheMainWindow()
     {
-        if (!QFileInfo::exists(rufwarteProgram()))
-            QSKIP("the rufwarte program is not built");
+        QVERIFY2(QFileInfo::exists(rufwarteProgram()), "the rufwarte program is missing from the build");
         AppTestEnv env;
         env.addCall(1, QStringLiteral("2024-05-14"), QStringLiteral("0301111"));
         MainWindowFactories f = defaultMainWindowFactories();

@@ -1,5 +1,5 @@
 #include "platform/AppException.h"
-#include "platform/BusyCursor.h"
+#include "platform/BusyReset.h"
 #include "platform/Clock.h"
 #include "platform/ErrorLog.h"
 #include "tests/support/ScriptedDialogService.h"
@@ -97,12 +97,13 @@ private Q_SLOTS:
     void showErrorShowsMessageWithExceptionAndResetsCursor()
     {
         auto log = makeLog();
-        BusyCursor::setHourglass();
-        BusyCursor::setHourglass();
-        QVERIFY(BusyCursor::isBusy());
+        static int resets = 0;
+        resets = 0;
+        setBusyResetHandler([] { ++resets; });
         const DatabaseFailure failure(QStringLiteral("lock conflict"));
         log->ShowError(QStringLiteral("# DM2 - DBConnect\r\nKeine Verbindung zur Datenbank!"), &failure);
-        QVERIFY(!BusyCursor::isBusy());
+        setBusyResetHandler(nullptr);
+        QCOMPARE(resets, 1);
         QCOMPARE(m_dialogs->service().texts(DialogKind::Error),
                  QStringList{QStringLiteral("# DM2 - DBConnect\r\nKeine Verbindung zur Datenbank!\r\n"
                                             "EIBInterBaseError / lock conflict")});

@@ -1,33 +1,12 @@
 #include "platform/WindowMessages.h"
+#include "tests/support/MessageReceiver.h"
 #include "tests/support/TestRegistry.h"
 
 #include <QTest>
 
 using namespace orvanta;
 
-namespace {
-
-class Receiver final : public QObject {
-public:
-    struct Got {
-        int message;
-        qintptr wParam;
-        qintptr lParam;
-    };
-    QList<Got> got;
-
-protected:
-    void customEvent(QEvent* event) override
-    {
-        if (WindowMessageEvent* msg = asWindowMessage(event)) {
-            got.append({msg->message(), msg->wParam(), msg->lParam()});
-            if (msg->message() == WMSAVECONDATA)
-                msg->setResult(msg->wParam() * 10 + msg->lParam());
-        }
-    }
-};
-
-} // namespace
+using Receiver = orvanta::test::MessageReceiver;
 
 class TestWindowMessages : public QObject {
     Q_OBJECT
@@ -65,6 +44,9 @@ private Q_SLOTS:
     void sendIsImmediateAndReturnsTheResult()
     {
         Receiver receiver;
+        receiver.answer = [](const WindowMessageEvent& m) -> qintptr {
+            return m.message() == WMSAVECONDATA ? m.wParam() * 10 + m.lParam() : 0;
+        };
         QCOMPARE(sendMessage(&receiver, WMSAVECONDATA, 4, 2), qintptr(42));
         QCOMPARE(receiver.got.size(), 1);
         QCOMPARE(sendMessage(&receiver, WMNEWCONTACT), qintptr(0));

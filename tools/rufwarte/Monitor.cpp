@@ -1,6 +1,6 @@
 #include "tools/rufwarte/Monitor.h"
 
-#include "app/MonitorLink.h"
+#include "platform/MonitorLink.h"
 #include "db/CredentialCipher.h"
 #include "db/FbAttachment.h"
 #include "db/FbStatement.h"

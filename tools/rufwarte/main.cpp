@@ -10,8 +10,8 @@
 //   rufwarte contact LOGID      asks the program to make a contact of that call's caller
 //   rufwarte quit | pause       sends the monitor quit or pause/resume
 
-#include "app/MonitorLink.h"
-#include "app/SharedEngine.h"
+#include "platform/MonitorLink.h"
+#include "db/SharedEngine.h"
 #include "db/FbAttachment.h"
 #include "phone/AreaCodes.h"
 #include "platform/AppException.h"

@@ -1,4 +1,6 @@
-#include "platform/BusyCursor.h"
+#include "ui/dialogs/BusyCursor.h"
+
+#include "platform/BusyReset.h"
 
 #include <QCursor>
 #include <QGuiApplication>
@@ -30,6 +32,8 @@ BusyCursor::~BusyCursor()
 
 void BusyCursor::setHourglass()
 {
+    // The first hourglass tells the error log how to end it.
+    setBusyResetHandler(&BusyCursor::resetCursor);
     if (haveGui())
         QGuiApplication::setOverrideCursor(QCursor(Qt::WaitCursor));
 }

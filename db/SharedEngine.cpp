@@ -1,6 +1,6 @@
-#include "app/SharedEngine.h"
+#include "db/SharedEngine.h"
 
-#include "app/MonitorLink.h"
+#include "platform/MonitorLink.h"
 
 #include <QDir>
 #include <QFile>

@@ -1,4 +1,4 @@
-// Precompiled for every target: the Qt headers nearly every file pulls in.
+// Precompiled for the presentation layer and everything above it.
 #pragma once
 #ifdef __cplusplus
 #include <QtCore>

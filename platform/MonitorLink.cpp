@@ -1,6 +1,5 @@
-#include "app/MonitorLink.h"
+#include "platform/MonitorLink.h"
 
-#include "app/AppServices.h"
 #include "platform/WindowMessages.h"
 
 #include <QDir>
@@ -121,15 +120,15 @@ bool MonitorLink::filterMessage(QObject* target, int message, qint64 wParam, qin
     Q_UNUSED(lParam);
     switch (message) {
     case MonitorLogChangedSend:
-        sendAppMessage(target, WMLOGINFOCHANGE, wParam, 0);
+        sendMessage(target, WMLOGINFOCHANGE, wParam, 0);
         return true;
     case MonitorLogChangedPost:
-        postAppMessage(target, WMLOGINFOCHANGE, wParam, 0);
+        postMessage(target, WMLOGINFOCHANGE, wParam, 0);
         return true;
     case MonitorIgnored:
         return true;
     case MonitorContactFromCall:
-        postAppMessage(target, WMCONTACTDATAFROMSCREEN, wParam, 0);
+        postMessage(target, WMCONTACTDATAFROMSCREEN, wParam, 0);
         return true;
     default:
         return false;

@@ -1,6 +1,8 @@
-#include "platform/BusyCursor.h"
+#include "ui/dialogs/BusyCursor.h"
 #include "platform/Clock.h"
 #include "platform/DialogService.h"
+#include "platform/ErrorLog.h"
+#include "ui/dialogs/MessageBoxDialogService.h"
 #include "platform/ProgramFolder.h"
 #include "tests/support/ScriptedDialogService.h"
 #include "tests/support/TestRegistry.h"
@@ -103,6 +105,29 @@ private Q_SLOTS:
         }
         // The scope made before the reset did not pop anything of its own after it.
         QVERIFY(QGuiApplication::overrideCursor() == nullptr);
+    }
+
+    void anErrorReportEndsTheHourglass()
+    {
+        test::ScopedScriptedDialogs scripted;
+        BusyCursor::setHourglass();
+        BusyCursor::setHourglass();
+        QVERIFY(BusyCursor::isBusy());
+        TvkErrorLog log(QDir::tempPath() + u'/', 0, QStringLiteral("orvanta-tst-dialogs.log"));
+        log.ShowError(QStringLiteral("kaputt"));
+        QVERIFY(!BusyCursor::isBusy());
+        QVERIFY(scripted.service().texts(DialogKind::Error).contains(QStringLiteral("kaputt")));
+        QFile::remove(QDir::tempPath() + QStringLiteral("/orvanta-tst-dialogs.log"));
+    }
+
+    void withoutAnInstalledServiceNothingBlocks()
+    {
+        // Command-line tools and early start-up have no message boxes: the answer is the one
+        // closing the box gives, at once.
+        QVERIFY(setDialogService(nullptr) == nullptr);
+        QCOMPARE(dialogs().question(QStringLiteral("Weiter?"), DialogButton::Yes | DialogButton::No), DialogButton::No);
+        QCOMPARE(dialogs().question(QStringLiteral("Weiter?"), DialogButton::Yes | DialogButton::No | DialogButton::Cancel),
+                 DialogButton::Cancel);
     }
 
     void programFolderAndClockAreReplaceable()
