@@ -55,9 +55,8 @@ void NoticeForm::showEvent(QShowEvent* event)
 
 void NoticeForm::ApplyColorScheme()
 {
-    static const QColor panels[3] = {QColor(0xC3DAF9), QColor(0xF2F0E4), QColor(0xF3F3F7)};
     QPalette pal = palette();
-    pal.setColor(QPalette::Window, panels[normalizedColorScheme(appColorScheme())]);
+    pal.setColor(QPalette::Window, detailWindowColors(appColorScheme()).window);
     setPalette(pal);
     setAutoFillBackground(true);
 }

@@ -27,24 +27,6 @@ namespace {
 const QString kLabel = QStringLiteral("# LogDetailForm - ");
 const QString kDash = QStringLiteral("-");
 
-struct DetailColors {
-    QColor window;
-    QColor header;
-    QColor border;
-};
-
-DetailColors detailColors(int scheme)
-{
-    switch (normalizedColorScheme(scheme)) {
-    case 0:
-        return {QColor(0xC3DAF9), QColor(0x033893), QColor(0x002C98)};
-    case 1:
-        return {QColor(0xF2F0E4), QColor(0x688048), QColor(0x788C60)};
-    default:
-        return {QColor(0xF3F3F7), QColor(0x757495), QColor(0x787C90)};
-    }
-}
-
 } // namespace
 
 TLogDetailForm::TLogDetailForm(TDM2* dm, QWidget* parent)
@@ -206,7 +188,7 @@ void TLogDetailForm::FormShow()
 
 void TLogDetailForm::ApplyColorScheme()
 {
-    const DetailColors c = detailColors(appColorScheme());
+    const DetailWindowColors& c = detailWindowColors(appColorScheme());
     QPalette wp = palette();
     wp.setColor(QPalette::Window, c.window);
     setPalette(wp);

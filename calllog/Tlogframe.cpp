@@ -10,9 +10,12 @@
 #include "platform/ErrorLog.h"
 #include "platform/ProgramFolder.h"
 #include "platform/WindowMessages.h"
+#include "ui/grid/GridColumnMenu.h"
 #include "ui/grid/GridController.h"
-#include "ui/grid/GridLayoutStore.h"
+#include "ui/grid/GridLayoutPersistence.h"
+#include "ui/grid/GridUpdateLock.h"
 #include "ui/grid/GridView.h"
+#include "ui/grid/ListFrameScaffold.h"
 #include "ui/label/TVKCutLabel.h"
 #include "ui/scheme/ColorScheme.h"
 
@@ -27,7 +30,6 @@
 #include <QPainter>
 #include <QPushButton>
 #include <QStyle>
-#include <QVBoxLayout>
 
 #include <array>
 
@@ -62,54 +64,7 @@ QByteArrayView serviceNameBytes(qint64 code)
     return names[static_cast<size_t>(code)];
 }
 
-// Locks the grid view against repaint for one scope.
-class ViewLock final {
-public:
-    explicit ViewLock(GridView* view)
-        : m_view(view)
-    {
-        m_view->beginUpdate();
-    }
-    ~ViewLock() { m_view->endUpdate(); }
-    ViewLock(const ViewLock&) = delete;
-    ViewLock& operator=(const ViewLock&) = delete;
-
-private:
-    GridView* m_view;
-};
-
-struct SchemeColors {
-    QColor fp3;
-    QColor fp3Border;
-    QColor separator;
-    QColor separatorHighlight;
-    QColor searchFlat;
-    QColor search;
-    QColor frame;
-};
-
-SchemeColors schemeColors(int scheme)
-{
-    switch (normalizedColorScheme(scheme)) {
-    case 0:
-        return {QColor(0xC3DAF9), QColor(0x002C98), QColor(0x033893), QColor(0x5987D6), QColor(0x002C98),
-                QColor(0xC3DAF9), QColor(0x002D96)};
-    case 1:
-        return {QColor(0xF2F0E4), QColor(0x788C60), QColor(0x688048), QColor(0xB0C080), QColor(0x788C60),
-                QColor(0xF2F0E4), QColor(0x608058)};
-    default:
-        return {QColor(0xF3F3F7), QColor(0x787C90), QColor(0x757495), QColor(0xA5A4BD), QColor(0x787C90),
-                QColor(0xF3F3F7), QColor(0x807C98)};
-    }
-}
-
-void setBackground(QWidget* w, const QColor& color)
-{
-    QPalette pal = w->palette();
-    pal.setColor(QPalette::Window, color);
-    w->setPalette(pal);
-    w->setAutoFillBackground(true);
-}
+using ViewLock = GridUpdateLock;
 
 } // namespace
 
@@ -186,33 +141,12 @@ QString Tlogframe::layoutFile(int viewMode)
 
 void Tlogframe::buildLayout()
 {
-    auto* outer = new QVBoxLayout(this);
-    outer->setContentsMargins(0, 0, 0, 0);
-    m_fp3 = new QFrame(this);
-    m_fp3->setObjectName(QStringLiteral("FP3"));
-    m_fp3->setFrameShape(QFrame::Box);
-    outer->addWidget(m_fp3);
-    auto* box = new QVBoxLayout(m_fp3);
-    box->setContentsMargins(1, 1, 1, 1);
-    box->setSpacing(0);
-
-    m_separator = new QFrame(m_fp3);
-    m_separator->setObjectName(QStringLiteral("RzSeparator2"));
-    auto* sepLayout = new QHBoxLayout(m_separator);
-    sepLayout->setContentsMargins(6, 2, 6, 2);
-    m_cl1 = new TVKCutLabel(m_separator);
-    m_cl1->setObjectName(QStringLiteral("CL1"));
-    m_cl1->setAutoSize(false);
-    QFont f(QStringLiteral("Verdana"));
-    f.setBold(true);
-    f.setPointSize(10);
-    m_cl1->setFont(f);
-    QPalette lp = m_cl1->palette();
-    lp.setColor(QPalette::WindowText, Qt::white);
-    m_cl1->setPalette(lp);
-    m_cl1->setFixedHeight(QFontMetrics(f).height() + 4);
-    sepLayout->addWidget(m_cl1);
-    box->addWidget(m_separator);
+    m_layouts = std::make_unique<GridLayoutPersistence>(kView);
+    m_layouts->setFile(0, layoutFile(0));
+    m_layouts->setFile(1, layoutFile(1));
+    m_scaffold = std::make_unique<ListFrameScaffold>(this);
+    m_fp3 = m_scaffold->panel();
+    m_cl1 = m_scaffold->caption();
 
     // The search panel: built complete, kept collapsed and disabled.
     m_searchPanel = new QFrame(m_fp3);
@@ -255,21 +189,13 @@ void Tlogframe::buildLayout()
     sp->addWidget(m_searchStart);
     sp->addWidget(m_searchClose);
     connect(m_searchClose, &QPushButton::clicked, this, [this] { postMessage(m_host, WMSEARCHUNCHECKED, 0, 0); });
-    box->addWidget(m_searchPanel);
+    m_scaffold->addPanel(m_searchPanel);
 
-    m_cxGrid1 = new QWidget(m_fp3);
-    m_cxGrid1->setObjectName(QStringLiteral("cxGrid1"));
-    auto* gl = new QVBoxLayout(m_cxGrid1);
-    gl->setContentsMargins(0, 0, 0, 0);
-    m_view = new GridView(m_cxGrid1);
-    m_view->setObjectName(QStringLiteral("cxGrid1DBTableView1"));
+    m_view = m_scaffold->addTableView(QStringLiteral("cxGrid1DBTableView1"));
     m_view->setHeaderHeight(21);
     m_view->setAutoWidth(true);
-    m_view->setGridLineColor(QColor(0xC0, 0xC0, 0xC0));
     m_view->setImages(logimages::eaImages());
     m_view->setCellPainter([this](QPainter& p, const GridCellInfo& cell) { return paintAbidCell(p, cell); });
-    gl->addWidget(m_view);
-    box->addWidget(m_cxGrid1, 1);
 }
 
 void Tlogframe::buildColumns()
@@ -414,8 +340,8 @@ void Tlogframe::buildActions()
     m_popup->addSeparator();
     m_popup->addAction(m_lfDelitem);
     m_popup->addSeparator();
-    m_ansicht = m_popup->addMenu(QStringLiteral("Ansicht"));
-    m_ansicht->setObjectName(QStringLiteral("Ansicht1"));
+    m_columnMenu = new GridColumnMenu(m_view, m_popup, QStringLiteral("Ansicht1"), this);
+    m_columnMenu->setClickHandler([this](QAction* entry) { Datum1Click(entry); });
     struct Entry {
         const char* name;
         const char* caption;
@@ -429,14 +355,8 @@ void Tlogframe::buildActions()
         {"Richtung1", "Verbindung", 8},  {"Verbindungszeit1", "Verbindungszeit", 9},
         {"Kosten1", "Kosten", 10},       {"AnrufbeantworterNachricht1", "Anrufbeantworter-Nachricht", 11},
     };
-    for (const Entry& e : entries) {
-        QAction* a = m_ansicht->addAction(QString::fromUtf8(e.caption));
-        a->setObjectName(QLatin1String(e.name));
-        a->setCheckable(true);
-        a->setProperty("tag", e.tag);
-        connect(a, &QAction::triggered, this, [this, a] { Datum1Click(a); });
-        m_columnEntries.append(a);
-    }
+    for (const Entry& e : entries)
+        m_columnMenu->addEntry(QLatin1String(e.name), QString::fromUtf8(e.caption), e.tag);
 }
 
 // ---------------------------------------------------------------------------------------------
@@ -498,7 +418,7 @@ bool Tlogframe::Firstep(QObject* host)
             log.open();
             bindSource();
             if (log.isActive())
-                GridLayoutStore::restoreFromFile(*controller(), layoutFile(0), kView);
+                m_layouts->restore(*controller(), 0);
             EnsureSorting();
         } catch (const std::exception& e) {
             if (m_dm)
@@ -511,7 +431,7 @@ bool Tlogframe::Firstep(QObject* host)
         if (OpenDBonDay(m_logDay) && m_dm && m_dm->ibcds_log.isActive()) {
             try {
                 ViewLock lock(m_view);
-                GridLayoutStore::restoreFromFile(*controller(), layoutFile(1), kView);
+                m_layouts->restore(*controller(), 1);
             } catch (const std::exception& e) {
                 reportError(kLabel + QStringLiteral("Firstep"), &e);
             }
@@ -528,14 +448,8 @@ bool Tlogframe::Firstep(QObject* host)
         for (const char* field : {"ABID", "CCHARGE", "CTIME"})
             controller()->setColumnVisible(controller()->columnByName(columnName(field)), false);
     }
-    for (const char* entry : {"AnrufbeantworterNachricht1", "Kosten1", "Verbindungszeit1"}) {
-        if (QAction* a = m_ansicht->findChild<QAction*>(QLatin1String(entry)))
-            a->setVisible(false);
-    }
-    for (QAction* a : m_columnEntries) {
-        if (!a->isVisible())
-            a->setChecked(false);
-    }
+    for (const char* entry : {"AnrufbeantworterNachricht1", "Kosten1", "Verbindungszeit1"})
+        m_columnMenu->withdrawEntry(QLatin1String(entry));
     UpdateLogCaption();
     PostLogStatus();
     SetTableViewPopup();
@@ -870,7 +784,7 @@ bool Tlogframe::StoreLogView()
 {
     try {
         if (m_dm && m_dm->ibcds_log.isActive()) {
-            if (!GridLayoutStore::storeToFile(*controller(), layoutFile(m_viewMode), kView))
+            if (!m_layouts->store(*controller(), m_viewMode))
                 logError(kLabel + QStringLiteral("StoreLogView\r\nDie Ansicht konnte nicht gespeichert werden."));
         }
         if (m_dm)
@@ -908,33 +822,11 @@ void Tlogframe::ResetSearchPanel()
 
 void Tlogframe::ApplyColorScheme()
 {
-    const SchemeColors c = schemeColors(appColorScheme());
-    setBackground(m_fp3, c.fp3);
-    QPalette fp = m_fp3->palette();
-    fp.setColor(QPalette::WindowText, c.fp3Border);
-    fp.setColor(QPalette::Light, c.fp3Border);
-    fp.setColor(QPalette::Dark, c.fp3Border);
-    m_fp3->setPalette(fp);
-    setBackground(m_separator, c.separator);
-    QPalette sp = m_separator->palette();
-    sp.setColor(QPalette::Light, c.separatorHighlight);
-    m_separator->setPalette(sp);
-    setBackground(m_searchPanel, c.search);
-    m_view->setGroupRowColor(c.fp3);
-    m_view->setGridLineColor(QColor(0xC0, 0xC0, 0xC0));
+    m_scaffold->applyColorScheme(appColorScheme());
 }
 
 // ---------------------------------------------------------------------------------------------
 // Column menu
-
-QAction* Tlogframe::menuEntryByTag(int tag) const
-{
-    for (QAction* a : m_columnEntries) {
-        if (a->property("tag").toInt() == tag)
-            return a;
-    }
-    return nullptr;
-}
 
 void Tlogframe::Datum1Click(QAction* entry)
 {
@@ -945,10 +837,7 @@ void Tlogframe::Datum1Click(QAction* entry)
 void Tlogframe::SetTableColVisibleState(bool visible, int tag)
 {
     try {
-        ViewLock lock(m_view);
-        const int c = controller()->columnByTag(tag);
-        if (c >= 0)
-            controller()->setColumnVisible(c, visible);
+        m_columnMenu->setColumnVisible(visible, tag);
     } catch (const std::exception& e) {
         reportError(kLabel + QStringLiteral("SetTableColVisibleState"), &e);
     }
@@ -957,15 +846,7 @@ void Tlogframe::SetTableColVisibleState(bool visible, int tag)
 void Tlogframe::SetTableViewPopup()
 {
     try {
-        ViewLock lock(m_view);
-        const QSignalBlocker block(m_ansicht);
-        for (const int c : controller()->visibleColumns()) {
-            const int tag = controller()->column(c).tag;
-            if (tag == 0)
-                continue;
-            if (QAction* a = menuEntryByTag(tag))
-                a->setChecked(true);
-        }
+        m_columnMenu->checkVisibleColumns();
     } catch (const std::exception& e) {
         reportError(kLabel + QStringLiteral("Firststep - SetTableViewPopup"), &e);
     }
@@ -973,13 +854,7 @@ void Tlogframe::SetTableViewPopup()
 
 void Tlogframe::cxGrid1DBTableView1ColumnPosChanged(int column)
 {
-    if (column < 0 || column >= controller()->columnCount() || controller()->isColumnVisible(column))
-        return;
-    const int tag = controller()->column(column).tag;
-    if (tag == 0)
-        return;
-    if (QAction* a = menuEntryByTag(tag))
-        a->setChecked(false);
+    m_columnMenu->columnDraggedOut(column);
 }
 
 void Tlogframe::showPopup(const QPoint& globalPos)

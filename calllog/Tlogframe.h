@@ -22,10 +22,13 @@ class QPushButton;
 
 namespace orvanta {
 
+class GridColumnMenu;
 class GridController;
 struct GridCellInfo;
+class GridLayoutPersistence;
 struct LogFieldIndexes;
 class GridView;
+class ListFrameScaffold;
 class RecordStoreGridSource;
 class TDM2;
 class TVKCutLabel;
@@ -98,7 +101,6 @@ private:
     void cxGrid1DBTableView1ColumnPosChanged(int column);
     void showPopup(const QPoint& globalPos);
     [[nodiscard]] bool paintAbidCell(QPainter& painter, const GridCellInfo& cell) const;
-    [[nodiscard]] QAction* menuEntryByTag(int tag) const;
     void clearFocusedRecord();
     [[nodiscard]] bool connected() const;
 
@@ -115,8 +117,9 @@ private:
     bool m_refreshing = false;
     int m_abidColumn = -1;
 
+    std::unique_ptr<ListFrameScaffold> m_scaffold;
+    std::unique_ptr<GridLayoutPersistence> m_layouts;
     QFrame* m_fp3 = nullptr;
-    QFrame* m_separator = nullptr; // RzSeparator2
     TVKCutLabel* m_cl1 = nullptr;
     QFrame* m_searchPanel = nullptr; // RzPanel1
     QLineEdit* m_cxTE1 = nullptr;
@@ -125,7 +128,6 @@ private:
     QLabel* m_l3 = nullptr;
     QPushButton* m_searchStart = nullptr;
     QPushButton* m_searchClose = nullptr;
-    QWidget* m_cxGrid1 = nullptr;
     GridView* m_view = nullptr;
 
     QAction* m_lfBemerkung = nullptr;
@@ -134,8 +136,7 @@ private:
     QAction* m_lfOpenContactFromLog = nullptr;
     QAction* m_lfPlayVoiceboxItem = nullptr;
     QMenu* m_popup = nullptr;  // AdvPopupMenu1
-    QMenu* m_ansicht = nullptr;
-    QList<QAction*> m_columnEntries;
+    GridColumnMenu* m_columnMenu = nullptr;
 };
 
 } // namespace orvanta

@@ -1,7 +1,9 @@
 #pragma once
 // The grid's data controller: columns, a source, and the index vectors that filtering, sorting
 // and grouping produce over it. No widgets: views (the table view now, a card view later) and
-// the layout store work through it, and tests drive it directly.
+// the layout store work through it, and tests drive it directly. The work itself is done by its
+// parts, GridRowFilter, GridSorter and GridGrouping; the controller keeps them in step, keeps
+// the focus, and announces changes.
 //
 // Rows are "display rows": data rows and, when grouped, group rows, in the order shown.
 // A "record" is a row index of the source.
@@ -9,13 +11,13 @@
 // Changes inside beginUpdate()/endUpdate() are computed on demand but announced once, at the
 // outermost endUpdate().
 
-#include "ui/grid/GridColumn.h"
-#include "ui/grid/GridFilter.h"
-#include "ui/grid/GridSource.h"
+#include "ui/grid/GridColumnState.h"
+#include "ui/grid/GridGrouping.h"
+#include "ui/grid/GridRowFilter.h"
+#include "ui/grid/GridSorter.h"
 
 #include <QDate>
 #include <QObject>
-#include <QSet>
 #include <functional>
 #include <vector>
 
@@ -69,8 +71,8 @@ public:
     // Adds the column as the last sort key, changes its order, or removes it (None).
     void setSortOrder(int c, GridSortOrder order);
     [[nodiscard]] GridSortOrder sortOrder(int c) const { return m_columns.at(static_cast<size_t>(c)).sortOrder; }
-    [[nodiscard]] int sortIndex(int c) const; // -1 when not a sort key
-    [[nodiscard]] const std::vector<int>& sortedColumns() const { return m_sort; }
+    [[nodiscard]] int sortIndex(int c) const { return m_sorter.sortIndex(c); } // -1 when not a sort key
+    [[nodiscard]] const std::vector<int>& sortedColumns() const { return m_sorter.sortedColumns(); }
     void clearSorting();
     // A header click: alone it sorts by this column only (toggling when it already does), with
     // Shift it adds or toggles a key, with Ctrl it removes the key.
@@ -84,19 +86,19 @@ public:
     // Removes the column from the grouping and shows it again.
     void ungroup(int c);
     void clearGrouping();
-    [[nodiscard]] const std::vector<int>& groupedColumns() const { return m_groups; }
-    [[nodiscard]] int groupIndex(int c) const;
-    [[nodiscard]] bool isGrouped() const { return !m_groups.empty(); }
+    [[nodiscard]] const std::vector<int>& groupedColumns() const { return m_grouping.columns(); }
+    [[nodiscard]] int groupIndex(int c) const { return m_grouping.indexOf(c); }
+    [[nodiscard]] bool isGrouped() const { return !m_grouping.isEmpty(); }
     // Direction of a grouped column's groups (ascending unless set).
     void setGroupSortOrder(int c, GridSortOrder order);
     void setGroupByBoxVisible(bool visible);
-    [[nodiscard]] bool isGroupByBoxVisible() const { return m_groupByBox; }
+    [[nodiscard]] bool isGroupByBoxVisible() const { return m_grouping.isGroupByBoxVisible(); }
     void expandAll(bool expand);
     void setGroupExpanded(int row, bool expanded);
     [[nodiscard]] bool isGroupExpanded(int row) const;
 
     // --- filter ----------------------------------------------------------------------------
-    [[nodiscard]] const GridFilter& filter() const { return m_filter; }
+    [[nodiscard]] const GridFilter& filter() const { return m_rowFilter.filter(); }
     void setFilter(const GridFilter& filter);
     void setFilterActive(bool active);
     void addFilterItem(GridFilterItem item);
@@ -107,7 +109,7 @@ public:
     // Today for the period conditions (default: the program clock); read whenever the filter
     // is applied.
     void setTodayProvider(std::function<QDate()> today);
-    [[nodiscard]] QDate today() const;
+    [[nodiscard]] QDate today() const { return m_rowFilter.today(); }
 
     // --- rows ------------------------------------------------------------------------------
     [[nodiscard]] int rowCount() const;
@@ -164,26 +166,6 @@ Q_SIGNALS:
 private:
     enum Dirty : unsigned { DirtyFilter = 1, DirtySort = 2, DirtyGroups = 4, DirtyDisplay = 8 };
 
-    struct ColumnState {
-        GridColumn def;
-        int field = -1;
-        GridSortOrder sortOrder = GridSortOrder::None;
-        bool textKey = false; // sorts by text
-    };
-    struct GroupNode {
-        quint32 first = 0;     // position in m_order
-        quint32 count = 0;
-        qint32 parent = -1;
-        quint32 childBegin = 0; // subgroups (next level), empty on the last level
-        quint32 childEnd = 0;
-        quint16 level = 0;
-        bool expanded = false;
-    };
-    struct Ranks {
-        std::vector<quint32> rank; // per source row
-        quint32 max = 0;
-        bool valid = false;
-    };
     struct FocusKey {
         int record = -1;
         int groupLevel = -1;
@@ -193,19 +175,7 @@ private:
     void invalidate(unsigned dirty);
     void ensureApplied() const;
     void apply();
-    void applyFilter();
-    void applySort();
-    void buildGroups();
-    void buildDisplay();
-    const Ranks& ranksOf(int c) const;
-    void computeTextRanks(int c, Ranks& out) const;
-    void computeNumericRanks(int c, Ranks& out) const;
-    [[nodiscard]] QByteArrayView keyText(int c, quint32 record) const;
-    [[nodiscard]] std::vector<int> sortKeys() const;
-    [[nodiscard]] GridSortOrder effectiveOrder(int c) const;
-    [[nodiscard]] QString groupKey(quint32 group) const;
     [[nodiscard]] int groupIdAt(int row) const;
-    [[nodiscard]] int rowOfGroup(quint32 group) const;
     [[nodiscard]] FocusKey focusKey() const;
     void restoreFocus(const FocusKey& key, bool focusFirst);
     void changeFocus(int row);
@@ -213,16 +183,11 @@ private:
     void announce();
     void announceColumns();
     void resolveFields();
-    [[nodiscard]] QString conditionText(const GridFilterItem& item) const;
-    [[nodiscard]] QString itemText(const GridFilterItem& item, bool top) const;
 
-    std::vector<ColumnState> m_columns;
+    GridColumnStates m_columns;
     std::vector<int> m_visual;
-    std::vector<int> m_sort;
-    std::vector<int> m_groups;
-    bool m_groupByBox = false;
-    GridFilter m_filter;
-    std::function<QDate()> m_today;
+    GridRowFilter m_rowFilter;
+    GridSorter m_sorter;
     const GridSource* m_source = nullptr;
     QString m_keyFieldName;
     int m_tag = 0;
@@ -236,15 +201,10 @@ private:
     int m_announcedRow = -1;
     FocusKey m_announcedKey;
 
-    // Computed (mutable: queries apply pending work on demand).
-    mutable std::vector<Ranks> m_ranks;
+    // Computed (queries apply pending work on demand).
     std::vector<quint32> m_filtered;
     std::vector<quint32> m_order;
-    std::vector<GroupNode> m_groupNodes;
-    quint32 m_topGroups = 0;
-    std::vector<quint32> m_display; // grouped only: group id | kGroupBit, or position in m_order
-    bool m_expandDefault = false;
-    QSet<QString> m_expandExceptions;
+    GridGrouping m_grouping;
     int m_focusRow = -1;
     FocusKey m_focusKey;
     bool m_focusedKeyValid = false;

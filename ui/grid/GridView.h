@@ -70,6 +70,7 @@ public:
     [[nodiscard]] QColor sortedColumnColor() const { return m_sortedColor; }
     void setGridLineColor(const QColor& color) { m_lineColor = color; viewport()->update(); }
     void setGroupRowColor(const QColor& color) { m_groupColor = color; viewport()->update(); }
+    [[nodiscard]] QColor groupRowColor() const { return m_groupColor; }
     // On: the visible columns always fill the width exactly, each in proportion to its own width,
     // and there is no horizontal scrolling; a column the user resizes trades space with the
     // columns to its right. Off: every column has its own width. Before the first call the last

@@ -1,6 +1,7 @@
 #pragma once
 // The application colour scheme: 0 blue, 1 olive, 2 silver. Read once at start-up from the
-// program folder's "OScheme"; every window paints its panels by it.
+// program folder's "OScheme"; every window paints its panels by it. The colours are one table per
+// kind of window, looked up by scheme, so that a window only says which of its parts gets which.
 
 #include <QColor>
 
@@ -28,5 +29,31 @@ struct MainWindowColors {
 };
 
 [[nodiscard]] MainWindowColors mainWindowColors(int scheme);
+
+// The list frames' colours (call log, contact list).
+struct ListFrameColors {
+    QColor panel;               // frame panel FP3
+    QColor panelBorder;         // FP3 highlight and shadow
+    QColor captionBar;          // the caption strip RzSeparator2
+    QColor captionBarHighlight;
+    QColor searchFlat;          // search panel border when flat
+    QColor search;              // search panel
+    QColor controlFrame;        // check-box and button frames
+    QColor footerStart;         // footer gradient, top to bottom
+    QColor footerEnd;
+    QColor footerBorder;
+    QColor cardTitleText;       // title text of a card that has no focus
+};
+
+[[nodiscard]] const ListFrameColors& listFrameColors(int scheme);
+
+// The detail and edit windows' colours; notice dialogs use the window colour.
+struct DetailWindowColors {
+    QColor window;
+    QColor header;  // title band
+    QColor border;
+};
+
+[[nodiscard]] const DetailWindowColors& detailWindowColors(int scheme);
 
 } // namespace orvanta

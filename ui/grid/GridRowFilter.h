@@ -1,0 +1,39 @@
+#pragma once
+// The filter part of the grid: holds the filter and today's date for the period conditions,
+// writes the filter's text and picks the source rows that pass it.
+
+#include "ui/grid/GridColumnState.h"
+#include "ui/grid/GridFilter.h"
+
+#include <QDate>
+#include <functional>
+#include <vector>
+
+namespace orvanta {
+
+class GridRowFilter final {
+public:
+    GridRowFilter();
+
+    [[nodiscard]] const GridFilter& filter() const { return m_filter; }
+    void setFilter(const GridFilter& filter);
+    // These return whether anything changed.
+    bool setActive(bool active);
+    void addItem(GridFilterItem item);
+    bool clearItems();
+
+    // nullptr: the program clock.
+    void setTodayProvider(std::function<QDate()> today);
+    [[nodiscard]] QDate today() const { return m_today(); }
+
+    // "TSDATE is this week", "(CONTBEZ LIKE 'A%' OR CONTBEZ LIKE 'a%')"; empty without items.
+    [[nodiscard]] QString text(const GridColumnStates& columns) const;
+    // Source rows passing the filter, ascending; every row when it is inactive or empty.
+    void apply(const GridSource& source, const GridColumnStates& columns, std::vector<quint32>& out) const;
+
+private:
+    GridFilter m_filter;
+    std::function<QDate()> m_today;
+};
+
+} // namespace orvanta
