@@ -5,17 +5,16 @@
 
 namespace orvanta {
 
-MainWindowFactories defaultMainWindowFactories()
+MainWindowFactories defaultMainWindowFactories(TDM2* dm)
 {
     // A view whose frame is not provided here shows an empty frame.
     MainWindowFactories f;
-    f.logFrame = [](QWidget* parent) -> LogListFrame* { return new Tlogframe(nullptr, parent); };
-    f.logDetailWindow = [](QWidget* mainWindow, int slot, int logKey) -> QWidget* {
-        auto* form = new TLogDetailForm(nullptr, nullptr);
+    f.logFrame = [dm](QWidget* parent) -> LogListFrame* { return new Tlogframe(dm, parent); };
+    f.logDetailWindow = [dm](QWidget* mainWindow, int slot, int logKey) -> QWidget* {
+        auto* form = new TLogDetailForm(dm, logKey);
         form->setAttribute(Qt::WA_DeleteOnClose, false);
         form->setHostWindow(mainWindow);
         form->setTag(slot);
-        form->setLogId(logKey);
         return form;
     };
     return f;

@@ -5,6 +5,7 @@
 
 namespace orvanta {
 
-[[nodiscard]] MainWindowFactories defaultMainWindowFactories();
+// dm: handed to every frame and window the factories make.
+[[nodiscard]] MainWindowFactories defaultMainWindowFactories(TDM2* dm);
 
 } // namespace orvanta

@@ -40,7 +40,7 @@ int Startup::run(int argc, char* argv[])
         QStringList parameters = QApplication::arguments();
         parameters.removeFirst();
         {
-            TLogform window(&dm, parameters, defaultMainWindowFactories());
+            TLogform window(&dm, parameters, defaultMainWindowFactories(&dm));
             window.show();
             code = QApplication::exec();
         }

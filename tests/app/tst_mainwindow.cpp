@@ -364,7 +364,7 @@ private Q_SLOTS:
         env.addCall(1, QStringLiteral("2024-05-14"), QStringLiteral("0301111"));
         env.addCall(2, QStringLiteral("2024-05-14"), QStringLiteral("0302222"));
         env.addCall(3, QStringLiteral("2024-05-10"), QStringLiteral("0303333"));
-        MainWindowFactories f = defaultMainWindowFactories();
+        MainWindowFactories f = defaultMainWindowFactories(&env.dm());
         f.logDetailWindow = [](QWidget*, int, int) -> QWidget* { return new QWidget; };
         env.writeFile(QStringLiteral("VStore"), "[Level_GV]\r\nAP=2\r\n");
         TLogform& w = env.window({}, f);

@@ -132,7 +132,7 @@ private Q_SLOTS:
             QSKIP("the rufwarte program is not built");
         AppTestEnv env;
         env.addCall(1, QStringLiteral("2024-05-14"), QStringLiteral("0301111"));
-        MainWindowFactories f = defaultMainWindowFactories();
+        MainWindowFactories f = defaultMainWindowFactories(&env.dm());
         f.contactEditWindow = [](QWidget*, int, int) -> QWidget* { return new QWidget; };
         TLogform& w = env.window({}, f);
         w.show();
