@@ -4,7 +4,6 @@
 #include "app/MonitorLink.h"
 #include "app/ProgramLauncher.h"
 #include "calllog/LogMaintenance.h"
-#include "phone/TvkMiniKontakt.h"
 #include "platform/AppException.h"
 #include "platform/BusyCursor.h"
 #include "platform/Clock.h"
@@ -379,9 +378,7 @@ void TLogform::tearDown()
     }
     freeFrames();
     QCoreApplication::sendPostedEvents(nullptr, 0);
-    m_editWindows.clear();
-    m_contactRecords.clear();
-    m_logDetailWindows.clear();
+    m_windows.clear();
     saveBars();
     m_monitor->stopListening();
     freeMonitorSettings();

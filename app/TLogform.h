@@ -4,7 +4,7 @@
 // edit windows, contact records and log detail windows, and receives every window message of
 // the program.
 
-#include "app/SlotRegistry.h"
+#include "app/WindowRegistries.h"
 #include "calllog/LogMaintenance.h"
 #include "ui/frames/ContactListFrame.h"
 #include "ui/frames/LogListFrame.h"
@@ -87,9 +87,9 @@ public:
     [[nodiscard]] QTimer* closeRetryTimer() const { return m_t1; }
 
     // Registries of open windows and records.
-    [[nodiscard]] WindowSlots& editWindows() { return m_editWindows; }
-    [[nodiscard]] ObjectSlots<TvkMiniKontakt>& contactRecords() { return m_contactRecords; }
-    [[nodiscard]] WindowSlots& logDetailWindows() { return m_logDetailWindows; }
+    [[nodiscard]] WindowSlots& editWindows() { return m_windows.editWindows(); }
+    [[nodiscard]] ObjectSlots<TvkMiniKontakt>& contactRecords() { return m_windows.contactRecords(); }
+    [[nodiscard]] WindowSlots& logDetailWindows() { return m_windows.logDetailWindows(); }
     // Puts a log detail window for the call into the registry (or brings an open one forward).
     int CreateLogDetailFo(int logKey);
     [[nodiscard]] bool IfLogDetailArrayAllFree();
@@ -170,7 +170,6 @@ private:
     void WMCLOSECONTACTFORM_(qintptr wParam);
     void WMSAVECONDATA_(qintptr wParam, qintptr lParam);
     void WMCLOSELOGDETAILFORM_(qintptr wParam);
-    void freeEditWindow(int editSlot);
 
     TDM2* m_dm;
     MainWindowFactories m_factories;
@@ -200,9 +199,7 @@ private:
     QPointer<ContactListFrame> m_contactFrame;
     QPointer<QWidget> m_emptyFrame;
 
-    WindowSlots m_editWindows;
-    ObjectSlots<TvkMiniKontakt> m_contactRecords;
-    WindowSlots m_logDetailWindows;
+    WindowRegistries m_windows;
 
     int m_startLogId = 0;
     bool m_busy = false;
