@@ -1,6 +1,6 @@
 #include "app/Startup.h"
 
-#include "app/MainWindowFactories.h"
+#include "app/MainWindowFeatures.h"
 #include "app/SharedEngine.h"
 #include "app/TLogform.h"
 #include "calllog/LogMaintenance.h"
@@ -40,7 +40,7 @@ int Startup::run(int argc, char* argv[])
         QStringList parameters = QApplication::arguments();
         parameters.removeFirst();
         {
-            TLogform window(&dm, parameters, defaultMainWindowFactories(&dm));
+            TLogform window(&dm, parameters, defaultMainWindowFeatures());
             window.show();
             code = QApplication::exec();
         }

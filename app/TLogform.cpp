@@ -47,10 +47,11 @@ QLabel* sectionLabel(const QString& text, const QString& name, QWidget* parent)
 
 } // namespace
 
-TLogform::TLogform(TDM2* dm, const QStringList& parameters, MainWindowFactories factories, QWidget* parent)
+TLogform::TLogform(TDM2* dm, const QStringList& parameters, const std::vector<MainWindowFeature>& features,
+                   QWidget* parent)
     : QMainWindow(parent)
     , m_dm(dm)
-    , m_factories(std::move(factories))
+    , m_actions(this)
 {
     setObjectName(QStringLiteral("TLogform"));
     setWindowTitle(QStringLiteral("Orvanta"));
@@ -75,6 +76,8 @@ TLogform::TLogform(TDM2* dm, const QStringList& parameters, MainWindowFactories 
     buildLayout();
     buildActions();
     buildMenusAndBars();
+    for (const MainWindowFeature& registerFeature : features)
+        registerFeature(*this);
 
     m_t1 = new QTimer(this);
     m_t1->setObjectName(QStringLiteral("T1"));
@@ -365,6 +368,7 @@ void TLogform::tearDown()
     if (m_tornDown)
         return;
     m_tornDown = true;
+    m_actions.freeze();
     m_updateTimer->stop();
     m_monitorTimer->stop();
     m_t1->stop();

@@ -1,4 +1,4 @@
-#include "app/MainWindowFactories.h"
+#include "app/MainWindowFeatures.h"
 #include "app/MonitorLink.h"
 #include "app/SharedEngine.h"
 #include "app/TLogform.h"
@@ -132,8 +132,10 @@ private Q_SLOTS:
             QSKIP("the rufwarte program is not built");
         AppTestEnv env;
         env.addCall(1, QStringLiteral("2024-05-14"), QStringLiteral("0301111"));
-        MainWindowFactories f = defaultMainWindowFactories(&env.dm());
-        f.contactEditWindow = [](QWidget*, int, int) -> QWidget* { return new QWidget; };
+        std::vector<MainWindowFeature> f = defaultMainWindowFeatures();
+        f.push_back([](TLogform& mainWindow) {
+            mainWindow.factories().contactEditWindow = [](QWidget*, int, int) -> QWidget* { return new QWidget; };
+        });
         TLogform& w = env.window({}, f);
         w.show();
         QTRY_COMPARE(w.statusPanels()->panelText(2), QStringLiteral("Protokolleinträge: 1"));
