@@ -75,6 +75,12 @@ public:
                 return static_cast<int>(i);
         return -1;
     }
+    // The slot the next take() fills: the first empty one, else a new one at the end.
+    [[nodiscard]] int nextSlot() const
+    {
+        const int free = firstFree();
+        return free >= 0 ? free : size();
+    }
     int take(QWidget* window)
     {
         int slot = firstFree();

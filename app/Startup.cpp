@@ -1,6 +1,6 @@
 #include "app/Startup.h"
 
-#include "app/MainWindowFactories.h"
+#include "app/MainWindowFeatures.h"
 #include "db/SharedEngine.h"
 #include "app/TLogform.h"
 #include "calllog/LogMaintenance.h"
@@ -43,7 +43,7 @@ int Startup::run(int argc, char* argv[])
         QStringList parameters = QApplication::arguments();
         parameters.removeFirst();
         {
-            TLogform window(&dm, parameters, defaultMainWindowFactories());
+            TLogform window(&dm, parameters, defaultMainWindowFeatures());
             window.show();
             code = QApplication::exec();
         }

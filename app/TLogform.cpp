@@ -4,7 +4,6 @@
 #include "platform/MonitorLink.h"
 #include "app/ProgramLauncher.h"
 #include "calllog/LogMaintenance.h"
-#include "phone/TvkMiniKontakt.h"
 #include "platform/AppException.h"
 #include "ui/dialogs/BusyCursor.h"
 #include "platform/Clock.h"
@@ -48,10 +47,11 @@ QLabel* sectionLabel(const QString& text, const QString& name, QWidget* parent)
 
 } // namespace
 
-TLogform::TLogform(TDM2* dm, const QStringList& parameters, MainWindowFactories factories, QWidget* parent)
+TLogform::TLogform(TDM2* dm, const QStringList& parameters, const std::vector<MainWindowFeature>& features,
+                   QWidget* parent)
     : QMainWindow(parent)
     , m_dm(dm)
-    , m_factories(std::move(factories))
+    , m_actions(this)
 {
     setObjectName(QStringLiteral("TLogform"));
     setWindowTitle(QStringLiteral("Orvanta"));
@@ -76,6 +76,8 @@ TLogform::TLogform(TDM2* dm, const QStringList& parameters, MainWindowFactories 
     buildLayout();
     buildActions();
     buildMenusAndBars();
+    for (const MainWindowFeature& registerFeature : features)
+        registerFeature(*this);
 
     m_t1 = new QTimer(this);
     m_t1->setObjectName(QStringLiteral("T1"));
@@ -366,6 +368,7 @@ void TLogform::tearDown()
     if (m_tornDown)
         return;
     m_tornDown = true;
+    m_actions.freeze();
     m_updateTimer->stop();
     m_monitorTimer->stop();
     m_t1->stop();
@@ -379,9 +382,7 @@ void TLogform::tearDown()
     }
     freeFrames();
     QCoreApplication::sendPostedEvents(nullptr, 0);
-    m_editWindows.clear();
-    m_contactRecords.clear();
-    m_logDetailWindows.clear();
+    m_windows.clear();
     saveBars();
     m_monitor->stopListening();
     freeMonitorSettings();

@@ -4,7 +4,8 @@
 // edit windows, contact records and log detail windows, and receives every window message of
 // the program.
 
-#include "app/SlotRegistry.h"
+#include "app/ActionRegistry.h"
+#include "app/WindowRegistries.h"
 #include "calllog/LogMaintenance.h"
 #include "ui/frames/ContactListFrame.h"
 #include "ui/frames/LogListFrame.h"
@@ -15,6 +16,7 @@
 
 #include <functional>
 #include <memory>
+#include <vector>
 
 class QAction;
 class QCheckBox;
@@ -37,10 +39,10 @@ class ProgramLauncher;
 class TDM2;
 class TvkMiniKontakt;
 
-// How the main window makes the frames and windows that other parts of the program provide.
-// A missing factory leaves the view with an empty frame (or opens no window).
 class TLogform;
 
+// How the main window makes the frames and windows that the features provide. A missing factory
+// leaves the view with an empty frame (or opens no window).
 struct MainWindowFactories {
     std::function<LogListFrame*(QWidget* parent)> logFrame;
     std::function<ContactListFrame*(QWidget* parent)> contactFrame;
@@ -56,6 +58,11 @@ struct MainWindowFactories {
     std::function<bool(TLogform& mainWindow, int recordSlot, int kind)> saveContact;
 };
 
+// A feature registers itself with the main window: it fills the factories of the frames and
+// windows it provides (handing them the main window's data module) and gives the actions it owns
+// their handlers and enable rules.
+using MainWindowFeature = std::function<void(TLogform& mainWindow)>;
+
 class TLogform final : public QMainWindow {
     Q_OBJECT
     Q_DISABLE_COPY_MOVE(TLogform)
@@ -63,7 +70,8 @@ class TLogform final : public QMainWindow {
 public:
     // dm may be null (no data module: every database step reports the missing connection).
     // parameters: the command-line parameters without the program name.
-    TLogform(TDM2* dm, const QStringList& parameters, MainWindowFactories factories = {},
+    // features: registered in this order once the actions exist, before anything is shown.
+    TLogform(TDM2* dm, const QStringList& parameters, const std::vector<MainWindowFeature>& features = {},
              QWidget* parent = nullptr);
     ~TLogform() override;
 
@@ -71,6 +79,9 @@ public:
     enum Tab { TabContacts = 0, TabCalendar = 1, TabLog = 2 };
 
     [[nodiscard]] TDM2* dataModule() const { return m_dm; }
+    // What the features register.
+    [[nodiscard]] MainWindowFactories& factories() { return m_factories; }
+    [[nodiscard]] ActionRegistry& actions() { return m_actions; }
     [[nodiscard]] AdvNavBar* navBar() const { return m_navBar; }
     [[nodiscard]] PlannerCalendar* calendar() const { return m_calendar; }
     [[nodiscard]] PanelStatusBar* statusPanels() const { return m_statusBar; }
@@ -87,9 +98,9 @@ public:
     [[nodiscard]] QTimer* closeRetryTimer() const { return m_t1; }
 
     // Registries of open windows and records.
-    [[nodiscard]] WindowSlots& editWindows() { return m_editWindows; }
-    [[nodiscard]] ObjectSlots<TvkMiniKontakt>& contactRecords() { return m_contactRecords; }
-    [[nodiscard]] WindowSlots& logDetailWindows() { return m_logDetailWindows; }
+    [[nodiscard]] WindowSlots& editWindows() { return m_windows.editWindows(); }
+    [[nodiscard]] ObjectSlots<TvkMiniKontakt>& contactRecords() { return m_windows.contactRecords(); }
+    [[nodiscard]] WindowSlots& logDetailWindows() { return m_windows.logDetailWindows(); }
     // Puts a log detail window for the call into the registry (or brings an open one forward).
     int CreateLogDetailFo(int logKey);
     [[nodiscard]] bool IfLogDetailArrayAllFree();
@@ -110,6 +121,10 @@ public:
     void refreshMonitorState();
 
     [[nodiscard]] QAction* action(const QString& objectName) const;
+    // Runs an action of the current view's frame; a failure is reported with the action's name.
+    void forwardToFrame(const QString& actionName);
+    // What the calendar's day marks work on.
+    [[nodiscard]] LogMarkContext markContext() const;
 
     // Closes the frames, registries and files in the tear-down order (also run by closeEvent).
     void tearDown();
@@ -140,7 +155,6 @@ private:
     void showContactFrame();
     void showLogFrame(int viewMode);
     void syncLogButtons();
-    [[nodiscard]] LogMarkContext markContext() const;
     void PC1DaySelected(QDate day);
     void contactGroupClicked(QCheckBox* box);
     void logGroupClicked(QCheckBox* box);
@@ -149,17 +163,13 @@ private:
     void selectPanelFromMenu(int tab);
 
     // actions
-    QAction* makeAction(const QString& name, const QString& caption, const std::function<void()>& execute);
-    [[nodiscard]] bool logFrameReady() const;
     [[nodiscard]] bool contactFrameReady() const;
-    [[nodiscard]] int selectedLogLID() const;
-    void DelLogExecute();
-    void DelDayLogExecute();
-    void OpenLogBemerkungExecute();
+    [[nodiscard]] bool contactSelected() const;
+    // The enable rule of an action forwarded to the current view's frame.
+    [[nodiscard]] bool frameAllows(const QString& actionName) const;
     void ContEditExecute();
     void ContDelExecute();
     void OEImpExecute();
-    void forwardToFrame(const QString& actionName);
     void runIfEnabled(const QString& actionName);
 
     // messages
@@ -170,10 +180,10 @@ private:
     void WMCLOSECONTACTFORM_(qintptr wParam);
     void WMSAVECONDATA_(qintptr wParam, qintptr lParam);
     void WMCLOSELOGDETAILFORM_(qintptr wParam);
-    void freeEditWindow(int editSlot);
 
     TDM2* m_dm;
     MainWindowFactories m_factories;
+    ActionRegistry m_actions;
     std::unique_ptr<LogMaintenance> m_maintenance;
     std::unique_ptr<MonitorLink> m_monitor;
     ProgramLauncher* m_launcher = nullptr;
@@ -200,9 +210,7 @@ private:
     QPointer<ContactListFrame> m_contactFrame;
     QPointer<QWidget> m_emptyFrame;
 
-    WindowSlots m_editWindows;
-    ObjectSlots<TvkMiniKontakt> m_contactRecords;
-    WindowSlots m_logDetailWindows;
+    WindowRegistries m_windows;
 
     int m_startLogId = 0;
     bool m_busy = false;

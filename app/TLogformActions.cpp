@@ -1,17 +1,14 @@
-// The main window's actions, menus and tool bars, with their enable rules.
+// The main window's actions, menus and tool bars, with the enable rules of its own actions (the
+// features give the actions they own theirs).
 
 #include "app/TLogform.h"
 
 #include "app/AppServices.h"
 #include "platform/MonitorLink.h"
 #include "app/ProgramLauncher.h"
-#include "calllog/LogMaintenance.h"
-#include "db/TDM2.h"
 #include "platform/ErrorLog.h"
-#include "ui/calendar/PlannerCalendar.h"
 #include "ui/frames/ContactListFrame.h"
 #include "ui/frames/LogListFrame.h"
-#include "ui/navbar/AdvNavBar.h"
 
 #include <QAction>
 #include <QMenu>
@@ -21,34 +18,9 @@
 
 namespace orvanta {
 
-namespace {
-
-// Actions forwarded to the frame of the current view.
-const char* const kForwarded[] = {"_LogFo_Search",          "_LogFo_LogSearch",
-                                  "_LogFo_AttachToContact", "_LogFo_lf_OpenContactFromLog",
-                                  "_LogFo_ContExport",      "_LogFo_PrintContactOverview",
-                                  "_LogFo_PrintContactExposee", "_LogFo_ContCall",
-                                  "_LogFo_PlayVBItem",      "_LogFo_Expand",
-                                  "_LogFo_Collapse"};
-
-} // namespace
-
-QAction* TLogform::makeAction(const QString& name, const QString& caption, const std::function<void()>& execute)
-{
-    auto* a = new QAction(caption, this);
-    a->setObjectName(name);
-    connect(a, &QAction::triggered, this, [this, execute, name] {
-        // An action runs only while enabled, whatever triggered it.
-        updateActions();
-        if (action(name)->isEnabled())
-            execute();
-    });
-    return a;
-}
-
 QAction* TLogform::action(const QString& objectName) const
 {
-    auto* a = findChild<QAction*>(objectName, Qt::FindDirectChildrenOnly);
+    QAction* a = m_actions.find(objectName);
     Q_ASSERT_X(a, "TLogform::action", qPrintable(objectName));
     return a;
 }
@@ -56,43 +28,46 @@ QAction* TLogform::action(const QString& objectName) const
 void TLogform::buildActions()
 {
     QStyle* st = style();
-    makeAction(QStringLiteral("_LogFo_Close"), QStringLiteral("Beenden"), [this] { close(); });
-    auto* closeApp = makeAction(QStringLiteral("_LogFo_CloseApp"), QStringLiteral("Beenden"),
-                                [this] { m_monitor->postToMonitor(MonitorLink::MonitorQuit); });
+    const auto add = [this](const char* name, const QString& caption, ActionRegistry::Handler execute = {},
+                            ActionRegistry::Rule enabled = {}) {
+        return m_actions.add(QString::fromLatin1(name), caption, std::move(execute), std::move(enabled));
+    };
+    const auto monitorRuns = [this] { return m_monitorExists; };
+    const auto contactsReady = [this] { return contactFrameReady(); };
+    const auto contactChosen = [this] { return contactSelected(); };
+
+    add("_LogFo_Close", QStringLiteral("Beenden"), [this] { close(); });
+    auto* closeApp = add("_LogFo_CloseApp", QStringLiteral("Beenden"),
+                         [this] { m_monitor->postToMonitor(MonitorLink::MonitorQuit); }, monitorRuns);
     closeApp->setToolTip(QStringLiteral("Rufwarte beenden"));
     closeApp->setStatusTip(QStringLiteral("Rufwarte beenden"));
     closeApp->setIcon(st->standardIcon(QStyle::SP_MediaStop));
-    makeAction(QStringLiteral("_LogFo_MoniSTOP"), QStringLiteral("Anhalten/Fortsetzen"),
-               [this] { m_monitor->postToMonitor(MonitorLink::MonitorPauseResume); })
+    add("_LogFo_MoniSTOP", QStringLiteral("Anhalten/Fortsetzen"),
+        [this] { m_monitor->postToMonitor(MonitorLink::MonitorPauseResume); }, monitorRuns)
         ->setIcon(st->standardIcon(QStyle::SP_MediaPause));
-    makeAction(QStringLiteral("_LogFo_MoniSTART"), QStringLiteral("Starten"),
-               [this] { m_launcher->start(QStringLiteral("rufwarte.exe"), {}, false); })
+    add("_LogFo_MoniSTART", QStringLiteral("Starten"),
+        [this] { m_launcher->start(QStringLiteral("rufwarte.exe"), {}, false); }, [this] { return !m_monitorExists; })
         ->setIcon(st->standardIcon(QStyle::SP_MediaPlay));
-    makeAction(QStringLiteral("_LogFo_Setup"), QStringLiteral("Einstellungen..."),
-               [this] { m_launcher->start(QStringLiteral("AppSetup.exe"), {}, false); });
-    makeAction(QStringLiteral("_LogFo_About"), QStringLiteral("Info"),
-               [this] { m_launcher->start(QStringLiteral("About.exe"), {}, false); })
+    add("_LogFo_Setup", QStringLiteral("Einstellungen..."),
+        [this] { m_launcher->start(QStringLiteral("AppSetup.exe"), {}, false); });
+    add("_LogFo_About", QStringLiteral("Info"), [this] { m_launcher->start(QStringLiteral("About.exe"), {}, false); })
         ->setIcon(st->standardIcon(QStyle::SP_MessageBoxInformation));
-    makeAction(QStringLiteral("_LogFo_OEImp"), QStringLiteral("Outlook Express"), [this] { OEImpExecute(); });
-    makeAction(QStringLiteral("_LogFo_Print"), QStringLiteral("Drucken"), [this] { forwardToFrame(QStringLiteral("_LogFo_Print")); })
-        ->setIcon(st->standardIcon(QStyle::SP_FileDialogDetailedView));
-    makeAction(QStringLiteral("_LogFo_Export"), QStringLiteral("Exportieren..."),
-               [this] { forwardToFrame(QStringLiteral("_LogFo_Export")); })
-        ->setIcon(st->standardIcon(QStyle::SP_DialogSaveButton));
-    makeAction(QStringLiteral("_LogFo_DelLog"), QStringLiteral("Protokolleintrag löschen"), [this] { DelLogExecute(); })
-        ->setIcon(st->standardIcon(QStyle::SP_TrashIcon));
-    makeAction(QStringLiteral("_LogFo_DelDayLog"), QStringLiteral("Tagesprotokoll löschen"), [this] { DelDayLogExecute(); });
-    makeAction(QStringLiteral("_LogFo_ContNew"), QStringLiteral("Neu..."), [this] { CreateConDataEdit(0, 0); })
+    add("_LogFo_OEImp", QStringLiteral("Outlook Express"), [this] { OEImpExecute(); },
+        [this] { return contactFrameReady() && !m_launcher->isWaiting(); });
+    // The log's actions get their behaviour from the call-log feature.
+    add("_LogFo_Print", QStringLiteral("Drucken"))->setIcon(st->standardIcon(QStyle::SP_FileDialogDetailedView));
+    add("_LogFo_Export", QStringLiteral("Exportieren..."))->setIcon(st->standardIcon(QStyle::SP_DialogSaveButton));
+    add("_LogFo_DelLog", QStringLiteral("Protokolleintrag löschen"))->setIcon(st->standardIcon(QStyle::SP_TrashIcon));
+    add("_LogFo_DelDayLog", QStringLiteral("Tagesprotokoll löschen"));
+    add("_LogFo_ContNew", QStringLiteral("Neu..."), [this] { CreateConDataEdit(0, 0); }, contactsReady)
         ->setIcon(st->standardIcon(QStyle::SP_FileIcon));
-    makeAction(QStringLiteral("_LogFo_ContEdit"), QStringLiteral("Bearbeiten..."), [this] { ContEditExecute(); })
+    add("_LogFo_ContEdit", QStringLiteral("Bearbeiten..."), [this] { ContEditExecute(); }, contactChosen)
         ->setIcon(st->standardIcon(QStyle::SP_FileDialogContentsView));
-    makeAction(QStringLiteral("_LogFo_ContDel"), QStringLiteral("Löschen"), [this] { ContDelExecute(); })
+    add("_LogFo_ContDel", QStringLiteral("Löschen"), [this] { ContDelExecute(); }, contactChosen)
         ->setIcon(st->standardIcon(QStyle::SP_DialogDiscardButton));
-    makeAction(QStringLiteral("_LogFo_OpenLogBemerkung"), QStringLiteral("Bemerkung/Detailinformationen"),
-               [this] { OpenLogBemerkungExecute(); })
+    add("_LogFo_OpenLogBemerkung", QStringLiteral("Bemerkung/Detailinformationen"))
         ->setIcon(st->standardIcon(QStyle::SP_FileDialogInfoView));
-    makeAction(QStringLiteral("_LogFo_KatVerw"), QStringLiteral("Kategorieverwaltung"),
-               [this] { forwardToFrame(QStringLiteral("_LogFo_KatVerw")); })
+    add("_LogFo_KatVerw", QStringLiteral("Kategorieverwaltung"), [this] { forwardToFrame(QStringLiteral("_LogFo_KatVerw")); })
         ->setIcon(st->standardIcon(QStyle::SP_DirIcon));
 
     const struct {
@@ -111,14 +86,13 @@ void TLogform::buildActions()
                      {"_LogFo_Collapse", "Alle Gruppen zuklappen"}};
     for (const auto& f : forwarded) {
         const QString name = QString::fromLatin1(f.name);
-        makeAction(name, QString::fromUtf8(f.caption), [this, name] { forwardToFrame(name); });
+        add(f.name, QString::fromUtf8(f.caption), [this, name] { forwardToFrame(name); },
+            [this, name] { return frameAllows(name); });
     }
 
-    makeAction(QStringLiteral("dxBB_Ansicht_Proto"), QStringLiteral("Protokoll"), [this] { selectPanelFromMenu(TabLog); });
-    makeAction(QStringLiteral("dxBB_Ansicht_Proto_PK"), QStringLiteral("Protokoll per Kalender"),
-               [this] { selectPanelFromMenu(TabCalendar); });
-    makeAction(QStringLiteral("dxBB_Ansicht_Kontakte"), QStringLiteral("Kontakte"),
-               [this] { selectPanelFromMenu(TabContacts); });
+    add("dxBB_Ansicht_Proto", QStringLiteral("Protokoll"), [this] { selectPanelFromMenu(TabLog); });
+    add("dxBB_Ansicht_Proto_PK", QStringLiteral("Protokoll per Kalender"), [this] { selectPanelFromMenu(TabCalendar); });
+    add("dxBB_Ansicht_Kontakte", QStringLiteral("Kontakte"), [this] { selectPanelFromMenu(TabContacts); });
 }
 
 void TLogform::buildMenusAndBars()
@@ -201,19 +175,27 @@ void TLogform::buildMenusAndBars()
 // ---------------------------------------------------------------------------------------------
 // Enable rules
 
-bool TLogform::logFrameReady() const
-{
-    return m_logFrame && !m_logFrame->isBusy();
-}
-
 bool TLogform::contactFrameReady() const
 {
     return m_contactFrame && m_contactFrame->isConnected();
 }
 
-int TLogform::selectedLogLID() const
+bool TLogform::contactSelected() const
 {
-    return m_logFrame ? m_logFrame->CurrentLogLID() : -1;
+    return contactFrameReady() && m_contactFrame->GetSelectedLID() > 0;
+}
+
+bool TLogform::frameAllows(const QString& actionName) const
+{
+    if (actionName == QLatin1String("_LogFo_PrintContactExposee"))
+        return contactSelected();
+    if (actionName == QLatin1String("_LogFo_Expand") || actionName == QLatin1String("_LogFo_Collapse"))
+        return (m_logFrame && m_logFrame->CanExpandGroups()) || (m_contactFrame && m_contactFrame->CanExpandGroups());
+    if (actionName == QLatin1String("_LogFo_ContExport") || actionName == QLatin1String("_LogFo_PrintContactOverview"))
+        return contactFrameReady();
+    if (m_logFrame)
+        return m_logFrame->isActionEnabled(actionName);
+    return m_contactFrame && m_contactFrame->isActionEnabled(actionName);
 }
 
 void TLogform::refreshMonitorState()
@@ -226,54 +208,12 @@ void TLogform::updateActions()
 {
     if (m_tornDown)
         return;
-    const auto set = [this](const char* name, bool enabled) {
-        QAction* a = action(QString::fromLatin1(name));
-        if (a->isEnabled() != enabled)
-            a->setEnabled(enabled);
-    };
-    set("_LogFo_CloseApp", m_monitorExists);
-    set("_LogFo_MoniSTOP", m_monitorExists);
-    set("_LogFo_MoniSTART", !m_monitorExists);
-
-    const bool logReady = logFrameReady();
-    set("_LogFo_Print", logReady);
-    set("_LogFo_Export", logReady);
-    set("_LogFo_DelLog", logReady);
-    set("_LogFo_DelDayLog", logReady && m_navBar->activeTabIndex() == TabCalendar);
-
-    const bool contactsReady = contactFrameReady();
-    const bool contactSelected = contactsReady && m_contactFrame->GetSelectedLID() > 0;
-    set("_LogFo_ContNew", contactsReady);
-    set("_LogFo_OEImp", contactsReady && !m_launcher->isWaiting());
-    set("_LogFo_ContEdit", contactSelected);
-    set("_LogFo_ContDel", contactSelected);
-    set("_LogFo_PrintContactExposee", contactSelected);
-    set("_LogFo_OpenLogBemerkung", selectedLogLID() > 0);
-
-    for (const char* name : kForwarded) {
-        const QString n = QString::fromLatin1(name);
-        if (n == QLatin1String("_LogFo_PrintContactExposee"))
-            continue;
-        bool enabled = false;
-        if (n == QLatin1String("_LogFo_Expand") || n == QLatin1String("_LogFo_Collapse"))
-            enabled = (m_logFrame && m_logFrame->CanExpandGroups())
-                || (m_contactFrame && m_contactFrame->CanExpandGroups());
-        else if (n == QLatin1String("_LogFo_ContExport") || n == QLatin1String("_LogFo_PrintContactOverview"))
-            enabled = contactsReady;
-        else if (m_logFrame)
-            enabled = m_logFrame->isActionEnabled(n);
-        else if (m_contactFrame)
-            enabled = m_contactFrame->isActionEnabled(n);
-        set(name, enabled);
-    }
+    m_actions.update();
 }
 
 void TLogform::runIfEnabled(const QString& actionName)
 {
-    updateActions();
-    QAction* a = action(actionName);
-    if (a->isEnabled())
-        a->trigger();
+    m_actions.runIfEnabled(actionName);
 }
 
 void TLogform::forwardToFrame(const QString& actionName)
@@ -298,48 +238,6 @@ void TLogform::forwardToFrame(const QString& actionName)
 
 // ---------------------------------------------------------------------------------------------
 // Execute handlers
-
-void TLogform::DelLogExecute()
-{
-    const int lid = selectedLogLID();
-    if (lid <= 0) {
-        informationBox(QStringLiteral("Bitte wählen Sie zuerst einen Logbucheintrag aus."));
-        return;
-    }
-    if (!askWarning(QStringLiteral("Markierten Protokolleintrag löschen?")))
-        return;
-    if (m_maintenance->DeleteLogItem(lid, this) && m_logFrame)
-        m_logFrame->Refresh_View(0);
-}
-
-void TLogform::DelDayLogExecute()
-{
-    if (!IfLogDetailArrayAllFree()) {
-        warningBox(QStringLiteral("Derzeit ist noch ein Informationsfenster eines\r\nProtokolleintrags geöffnet.\r\n"
-                                  "Bitte schließen Sie vor dem Löschen erst alle\r\nFenster mit den Detailinformationen."));
-        return;
-    }
-    if (!m_logFrame)
-        return;
-    const QDate day = m_logFrame->logDay();
-    if (!askWarning(QStringLiteral("Tagesprotokoll vom ") + day.toString(QStringLiteral("dd.MM.yyyy"))
-                    + QStringLiteral(" löschen?")))
-        return;
-    const bool deleted = m_maintenance->DeleteLogDay(day, this);
-    const bool marked = m_maintenance->markLogDays(1, markContext());
-    if (deleted && marked)
-        informationBox(QStringLiteral("Tagesprotokoll wurde erfolgreich gelöscht."));
-}
-
-void TLogform::OpenLogBemerkungExecute()
-{
-    const int lid = selectedLogLID();
-    if (lid <= 0) {
-        informationBox(QStringLiteral("Bitte wählen Sie zuerst einen Logbucheintrag aus."));
-        return;
-    }
-    CreateLogDetailFo(lid);
-}
 
 void TLogform::ContEditExecute()
 {

@@ -1,4 +1,4 @@
-// The main window's window messages and its registries of open windows and records.
+// The main window's window messages and what it opens into its registries of windows and records.
 
 #include "app/TLogform.h"
 
@@ -20,13 +20,11 @@ namespace orvanta {
 
 namespace {
 
-// Window properties the main window sets on the edit and detail windows it creates.
-constexpr const char* kTag = "tag";                  // slot in the window's registry
-constexpr const char* kRecordSlot = "recordSlot";    // slot of the edit window's contact record
+// Window properties the main window sets on the edit windows it creates (the registries set the
+// slots).
 constexpr const char* kExisting = "existingContact"; // edits a stored contact
 constexpr const char* kCallerNumber = "callerNumber";
 constexpr const char* kSaveFailed = "saveFailed";
-constexpr const char* kLogKey = "logKey";
 
 void bringToFront(QWidget* w)
 {
@@ -143,43 +141,27 @@ void TLogform::WMCLOSECONTACTFORM_(qintptr wParam)
 {
     try {
         if (fitsInt(wParam))
-            freeEditWindow(static_cast<int>(wParam));
+            m_windows.freeEditWindow(static_cast<int>(wParam));
     } catch (const std::exception& e) {
         reportError(QStringLiteral("# Orvanta - WMCLOSECONTACTFORM"), &e);
     }
 }
 
-void TLogform::freeEditWindow(int editSlot)
-{
-    QWidget* w = m_editWindows.at(editSlot);
-    if (!w)
-        return;
-    const QVariant recordSlot = w->property(kRecordSlot);
-    if (recordSlot.isValid())
-        m_contactRecords.free(recordSlot.toInt());
-    m_editWindows.free(editSlot);
-}
-
 void TLogform::WMSAVECONDATA_(qintptr wParam, qintptr lParam)
 {
-    if (m_contactRecords.isEmpty()) {
+    if (m_windows.contactRecords().isEmpty()) {
         reportError(QStringLiteral("# Orvanta - WMSAVECONDATA\r\nDatentyp ist nicht initialisiert!\r\n"
                                    "Kontaktdaten können nicht gespeichert werden."));
         return;
     }
     const int slot = fitsInt(wParam) ? static_cast<int>(wParam) : -1;
-    if (!m_contactRecords.at(slot)) {
+    if (!m_windows.contactRecords().at(slot)) {
         reportError(QStringLiteral("# Orvanta - WMSAVECONDATA\r\nDaten-Item ist nicht initialisiert!\r\n"
                                    "Kontaktdaten können nicht gespeichert werden."));
         return;
     }
     // The window that shows this record learns whether its save failed.
-    QWidget* window = nullptr;
-    for (int i = 0; i < m_editWindows.size(); ++i) {
-        QWidget* w = m_editWindows.at(i);
-        if (w && w->property(kRecordSlot).toInt() == slot)
-            window = w;
-    }
+    QWidget* window = m_windows.editWindowOfRecord(slot);
     bool saved = false;
     try {
         saved = m_factories.saveContact && m_factories.saveContact(*this, slot, static_cast<int>(lParam));
@@ -194,7 +176,7 @@ void TLogform::WMCLOSELOGDETAILFORM_(qintptr wParam)
 {
     try {
         if (fitsInt(wParam))
-            m_logDetailWindows.free(static_cast<int>(wParam));
+            m_windows.freeLogDetail(static_cast<int>(wParam));
     } catch (const std::exception& e) {
         reportError(QStringLiteral("# Orvanta - WMCLOSELOGDETAILFORM"), &e);
     }
@@ -206,7 +188,7 @@ void TLogform::WMCLOSELOGDETAILFORM_(qintptr wParam)
 bool TLogform::IfLogDetailArrayAllFree()
 {
     try {
-        return m_logDetailWindows.allFree();
+        return m_windows.allLogDetailsFree();
     } catch (const std::exception& e) {
         reportError(QStringLiteral("# Orvanta - IfLogDetailArrayAllFree"), &e);
         return false;
@@ -216,12 +198,9 @@ bool TLogform::IfLogDetailArrayAllFree()
 bool TLogform::SearchWndAndShowLogDetail(int logKey)
 {
     try {
-        for (int i = 0; i < m_logDetailWindows.size(); ++i) {
-            QWidget* w = m_logDetailWindows.at(i);
-            if (w && w->property(kLogKey).toInt() == logKey) {
-                bringToFront(w);
-                return true;
-            }
+        if (QWidget* w = m_windows.logDetailWindows().at(m_windows.logDetailSlotOf(logKey))) {
+            bringToFront(w);
+            return true;
         }
     } catch (const std::exception& e) {
         reportError(QStringLiteral("# Orvanta - SearchWndAndShowLogDetail"), &e);
@@ -232,21 +211,14 @@ bool TLogform::SearchWndAndShowLogDetail(int logKey)
 int TLogform::CreateLogDetailFo(int logKey)
 {
     try {
-        if (SearchWndAndShowLogDetail(logKey)) {
-            for (int i = 0; i < m_logDetailWindows.size(); ++i)
-                if (QWidget* w = m_logDetailWindows.at(i); w && w->property(kLogKey).toInt() == logKey)
-                    return i;
-        }
+        if (SearchWndAndShowLogDetail(logKey))
+            return m_windows.logDetailSlotOf(logKey);
         if (!m_factories.logDetailWindow)
             return -1;
-        const int free = m_logDetailWindows.firstFree();
-        const int slot = free >= 0 ? free : m_logDetailWindows.size();
-        QWidget* w = m_factories.logDetailWindow(this, slot, logKey);
+        QWidget* w = m_factories.logDetailWindow(this, m_windows.nextLogDetailSlot(), logKey);
         if (!w)
             return -1;
-        w->setProperty(kTag, slot);
-        w->setProperty(kLogKey, logKey);
-        m_logDetailWindows.take(w);
+        const int slot = m_windows.addLogDetail(w, logKey);
         w->show();
         return slot;
     } catch (const std::exception& e) {
@@ -258,9 +230,7 @@ int TLogform::CreateLogDetailFo(int logKey)
 bool TLogform::IfContactDataArrayExists(int contactKey)
 {
     try {
-        for (int i = 0; i < m_contactRecords.size(); ++i)
-            if (const TvkMiniKontakt* r = m_contactRecords.at(i); r && r->LID() == contactKey)
-                return true;
+        return m_windows.recordSlotOf(contactKey) >= 0;
     } catch (const std::exception& e) {
         reportError(QStringLiteral("# Orvanta - IfContactDataArrayExists"), &e);
     }
@@ -270,18 +240,12 @@ bool TLogform::IfContactDataArrayExists(int contactKey)
 bool TLogform::SearchWNDAndShow(int contactKey)
 {
     try {
-        int recordSlot = -1;
-        for (int i = 0; i < m_contactRecords.size() && recordSlot < 0; ++i)
-            if (const TvkMiniKontakt* r = m_contactRecords.at(i); r && r->LID() == contactKey)
-                recordSlot = i;
+        const int recordSlot = m_windows.recordSlotOf(contactKey);
         if (recordSlot < 0)
             return false;
-        for (int i = 0; i < m_editWindows.size(); ++i) {
-            QWidget* w = m_editWindows.at(i);
-            if (w && w->property(kRecordSlot).toInt() == recordSlot) {
-                bringToFront(w);
-                return true;
-            }
+        if (QWidget* w = m_windows.editWindowOfRecord(recordSlot)) {
+            bringToFront(w);
+            return true;
         }
     } catch (const std::exception& e) {
         reportError(QStringLiteral("# Orvanta - SearchWNDAndShow"), &e);
@@ -319,25 +283,21 @@ int TLogform::CreateConDataEdit(int contactKey, int logKey)
         if (!m_factories.loadContact || !m_factories.loadContact(*this, *record, contactKey))
             return -1;
     }
-    const int recordSlot = m_contactRecords.take(std::move(record));
-    const int free = m_editWindows.firstFree();
-    const int editSlot = free >= 0 ? free : m_editWindows.size();
+    const int recordSlot = m_windows.addRecord(std::move(record));
     QWidget* window = nullptr;
     try {
-        window = m_factories.contactEditWindow(this, editSlot, recordSlot);
+        window = m_factories.contactEditWindow(this, m_windows.nextEditSlot(), recordSlot);
     } catch (const std::exception& e) {
         reportError(QStringLiteral("# Orvanta - CreateConDataEdit"), &e);
     }
     if (!window) {
-        m_contactRecords.free(recordSlot);
+        m_windows.freeRecord(recordSlot);
         return -1;
     }
-    window->setProperty(kTag, editSlot);
-    window->setProperty(kRecordSlot, recordSlot);
     window->setProperty(kExisting, contactKey != 0);
     window->setProperty(kCallerNumber, callerNumber);
     window->setProperty(kSaveFailed, false);
-    m_editWindows.take(window);
+    const int editSlot = m_windows.addEditWindow(window, recordSlot);
     window->show();
     return editSlot;
 }

@@ -1,5 +1,6 @@
 #include "calllog/LogMaintenance.h"
 
+#include "calllog/LogConnection.h"
 #include "db/FbStatement.h"
 #include "db/FbTransaction.h"
 #include "db/TDM2.h"
@@ -17,14 +18,10 @@ namespace {
 
 const QString kDateFormat = QStringLiteral("dd.MM.yyyy");
 
+// Shorthand for the check every operation starts with.
 bool connected(TDM2* dm)
 {
-    if (!dm) {
-        BusyCursor::resetCursor();
-        reportError(QStringLiteral("# DM2 - DBConnect\r\nKeine Verbindung zur Datenbank!"));
-        return false;
-    }
-    return dm->DBConnect();
+    return logDatabaseConnected(dm);
 }
 
 // A failed operation leaves nothing open or half-done behind and says what went wrong.

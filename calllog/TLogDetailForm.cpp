@@ -1,5 +1,6 @@
 #include "calllog/TLogDetailForm.h"
 
+#include "calllog/LogConnection.h"
 #include "db/TDM2.h"
 #include "phone/PhoneNumbers.h"
 #include "ui/dialogs/BusyCursor.h"
@@ -29,9 +30,10 @@ const QString kDash = QStringLiteral("-");
 
 } // namespace
 
-TLogDetailForm::TLogDetailForm(TDM2* dm, QWidget* parent)
+TLogDetailForm::TLogDetailForm(TDM2* dm, int logId, QWidget* parent)
     : QWidget(parent, Qt::Window)
-    , m_dm(dm ? dm : DM2())
+    , m_dm(dm)
+    , m_logId(logId)
 {
     setObjectName(QStringLiteral("LogDetailForm"));
     setWindowTitle(QStringLiteral("Bemerkung/Detailinformationen"));
@@ -203,7 +205,7 @@ void TLogDetailForm::ApplyColorScheme()
 
 bool TLogDetailForm::GetLogDSData()
 {
-    if (!m_dm || !m_dm->DBConnect())
+    if (!logDatabaseConnected(m_dm))
         return false;
     BusyCursor busy;
     DataSet& q = m_dm->LogDetailQuery;
@@ -301,7 +303,7 @@ bool TLogDetailForm::GetLogDSData()
 
 bool TLogDetailForm::SetBemerkung()
 {
-    if (!m_dm || !m_dm->DBConnect())
+    if (!logDatabaseConnected(m_dm))
         return false;
     BusyCursor busy;
     DataSet& q = m_dm->LogDetailQuery;

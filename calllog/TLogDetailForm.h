@@ -1,7 +1,7 @@
 #pragma once
 // The detail window of one call: every stored detail of a LOG record on two pages, and its
-// remark to edit. The host creates one per call, sets the log id, its own window and the slot
-// (tag), and is told by WMCLOSELOGDETAILFORM when the window closes; after each save it gets
+// remark to edit. The host creates one per call with that call's log id, sets its own window and
+// the slot (tag), and is told by WMCLOSELOGDETAILFORM when the window closes; after each save it gets
 // WMLOGINFOCHANGE so the log list re-reads and refocuses the call.
 
 #include <QPointer>
@@ -25,11 +25,11 @@ class TLogDetailForm final : public QWidget {
     Q_DISABLE_COPY_MOVE(TLogDetailForm)
 
 public:
-    // dm: the data module (nullptr: the shared one).
-    explicit TLogDetailForm(TDM2* dm = nullptr, QWidget* parent = nullptr);
+    // dm: the data module (without one, loading and saving report the missing connection).
+    // logId: the call shown, fixed for the window's life.
+    TLogDetailForm(TDM2* dm, int logId, QWidget* parent = nullptr);
     ~TLogDetailForm() override;
 
-    void setLogId(int lid) { m_logId = lid; }
     [[nodiscard]] int logId() const { return m_logId; }
     void setHostWindow(QObject* host) { m_host = host; }
     // The slot in the host's registry (also the "tag" property the host may set itself).
@@ -64,7 +64,7 @@ private:
 
     TDM2* m_dm;
     QPointer<QObject> m_host;
-    int m_logId = 0;
+    const int m_logId;
     QString m_savedRemark;
     bool m_locked = false;
     bool m_shown = false;

@@ -84,7 +84,7 @@ struct LogFieldIndexes {
 
 Tlogframe::Tlogframe(TDM2* dm, QWidget* parent)
     : LogListFrame(parent)
-    , m_dm(dm ? dm : DM2())
+    , m_dm(dm)
 {
     setObjectName(QStringLiteral("logframe"));
     buildLayout();

@@ -38,8 +38,8 @@ class Tlogframe final : public LogListFrame {
     Q_DISABLE_COPY_MOVE(Tlogframe)
 
 public:
-    // dm: the data module to read from (nullptr: the shared one).
-    explicit Tlogframe(TDM2* dm = nullptr, QWidget* parent = nullptr);
+    // dm: the data module to read from; without one every opening reports the missing connection.
+    explicit Tlogframe(TDM2* dm, QWidget* parent = nullptr);
     ~Tlogframe() override;
 
     // --- what the host calls --------------------------------------------------------------

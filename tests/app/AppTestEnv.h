@@ -4,6 +4,7 @@
 // (mutexes, message sockets), scripted dialogs and a fixed clock. The main window itself creates
 // the error log.
 
+#include "app/CallLogFeature.h"
 #include "app/TLogform.h"
 #include "db/CredentialCipher.h"
 #include "platform/ProgramFolder.h"
@@ -18,6 +19,7 @@
 
 #include <functional>
 #include <memory>
+#include <vector>
 
 namespace orvanta::test {
 
@@ -51,11 +53,12 @@ public:
                       .arg(date, frombez, fromphone));
     }
 
-    // The main window on the data module (created on first use) with the given parameters.
-    TLogform& window(const QStringList& parameters = {}, MainWindowFactories factories = {})
+    // The main window on the data module (created on first use) with the given parameters and
+    // features (none: every view shows an empty frame).
+    TLogform& window(const QStringList& parameters = {}, const std::vector<MainWindowFeature>& features = {})
     {
         if (!m_window)
-            m_window = std::make_unique<TLogform>(&dm(), parameters, std::move(factories));
+            m_window = std::make_unique<TLogform>(&dm(), parameters, features);
         return *m_window;
     }
     [[nodiscard]] TLogform* existingWindow() const { return m_window.get(); }
@@ -141,18 +144,26 @@ private:
     QString m_caption;
 };
 
-// Factories whose log list is a RecordingLogFrame; the created frames land in *frames.
-inline MainWindowFactories recordingFactories(QList<QPointer<RecordingLogFrame>>* frames)
+// Replaces the detail and edit windows with plain ones after the features have registered.
+inline MainWindowFeature plainWindows()
 {
-    MainWindowFactories f;
-    f.logFrame = [frames](QWidget* parent) -> LogListFrame* {
-        auto* frame = new RecordingLogFrame(parent);
-        frames->append(frame);
-        return frame;
+    return [](TLogform& w) {
+        w.factories().logDetailWindow = [](QWidget*, int, int) -> QWidget* { return new QWidget; };
+        w.factories().contactEditWindow = [](QWidget*, int, int) -> QWidget* { return new QWidget; };
     };
-    f.logDetailWindow = [](QWidget*, int, int) -> QWidget* { return new QWidget; };
-    f.contactEditWindow = [](QWidget*, int, int) -> QWidget* { return new QWidget; };
-    return f;
+}
+
+// The call log's actions as in the program, but its list is a RecordingLogFrame (the created
+// frames land in *frames) and its windows are plain ones.
+inline std::vector<MainWindowFeature> recordingFeatures(QList<QPointer<RecordingLogFrame>>* frames)
+{
+    return {registerCallLogFeature, plainWindows(), [frames](TLogform& w) {
+                w.factories().logFrame = [frames](QWidget* parent) -> LogListFrame* {
+                    auto* frame = new RecordingLogFrame(parent);
+                    frames->append(frame);
+                    return frame;
+                };
+            }};
 }
 
 } // namespace orvanta::test

@@ -1,4 +1,4 @@
-#include "app/MainWindowFactories.h"
+#include "app/MainWindowFeatures.h"
 #include "app/ProgramLauncher.h"
 #include "app/TLogform.h"
 #include "platform/IniFile.h"
@@ -179,7 +179,7 @@ private Q_SLOTS:
         QList<QPointer<RecordingLogFrame>> frames;
         AppTestEnv env;
         {
-            TLogform& w = env.window({}, test::recordingFactories(&frames));
+            TLogform& w = env.window({}, test::recordingFeatures(&frames));
             w.show();
             w.navBar()->setActiveTabIndex(TLogform::TabCalendar);
             w.AdvNavBar1Change();
@@ -251,7 +251,7 @@ private Q_SLOTS:
         QList<QPointer<RecordingLogFrame>> frames;
         AppTestEnv env;
         env.addCall(17, QStringLiteral("2024-05-15"), QStringLiteral("0891234567"));
-        TLogform& w = env.window({QStringLiteral("/co-17")}, test::recordingFactories(&frames));
+        TLogform& w = env.window({QStringLiteral("/co-17")}, test::recordingFeatures(&frames));
         QCOMPARE(w.startLogRecordId(), 17);
         QCoreApplication::processEvents();
         QVERIFY(w.editWindows().allFree()); // nothing before the window is shown
@@ -273,7 +273,7 @@ private Q_SLOTS:
         env.db().exec(QStringLiteral("INSERT INTO CONTACT (LID, CONTBEZ) VALUES (5, 'Huber')"));
         env.db().exec(QStringLiteral("INSERT INTO COM (LID, CID, KOMMBEZ, NUMBER, VORWNUMBER, NUMBEROF) "
                                      "VALUES (50, 5, 'Mobil', '1234567', '891234567', '891234567')"));
-        TLogform& w = env.window({}, test::recordingFactories(&frames));
+        TLogform& w = env.window({}, test::recordingFeatures(&frames));
         env.dialogs().enqueueAnswer(DialogButton::No);
         sendMessage(&w, WMCONTACTDATAFROMSCREEN, 17, 0);
         QVERIFY(w.editWindows().allFree());
@@ -308,7 +308,7 @@ private Q_SLOTS:
     {
         QList<QPointer<RecordingLogFrame>> frames;
         AppTestEnv env;
-        TLogform& w = env.window({}, test::recordingFactories(&frames));
+        TLogform& w = env.window({}, test::recordingFeatures(&frames));
         QCOMPARE(w.CreateLogDetailFo(101), 0);
         QCOMPARE(w.CreateLogDetailFo(102), 1);
         QCOMPARE(w.CreateLogDetailFo(103), 2);
@@ -348,7 +348,7 @@ private Q_SLOTS:
                                                            "\r\nKontaktdaten können nicht gespeichert werden."));
         QList<QPointer<RecordingLogFrame>> frames;
         env.destroyWindow();
-        TLogform& w2 = env.window({}, test::recordingFactories(&frames));
+        TLogform& w2 = env.window({}, test::recordingFeatures(&frames));
         w2.CreateConDataEdit(0, 0);
         sendMessage(&w2, WMSAVECONDATA, 5, 0);
         QCOMPARE(env.dialogs().last().text, QStringLiteral("# Orvanta - WMSAVECONDATA\r\nDaten-Item ist nicht "
@@ -364,8 +364,8 @@ private Q_SLOTS:
         env.addCall(1, QStringLiteral("2024-05-14"), QStringLiteral("0301111"));
         env.addCall(2, QStringLiteral("2024-05-14"), QStringLiteral("0302222"));
         env.addCall(3, QStringLiteral("2024-05-10"), QStringLiteral("0303333"));
-        MainWindowFactories f = defaultMainWindowFactories();
-        f.logDetailWindow = [](QWidget*, int, int) -> QWidget* { return new QWidget; };
+        std::vector<MainWindowFeature> f = defaultMainWindowFeatures();
+        f.push_back(test::plainWindows());
         env.writeFile(QStringLiteral("VStore"), "[Level_GV]\r\nAP=2\r\n");
         TLogform& w = env.window({}, f);
         w.show();
@@ -403,7 +403,7 @@ private Q_SLOTS:
     {
         QList<QPointer<RecordingLogFrame>> frames;
         AppTestEnv env;
-        TLogform& w = env.window({}, test::recordingFactories(&frames));
+        TLogform& w = env.window({}, test::recordingFeatures(&frames));
         w.show();
         QVERIFY(!frames.isEmpty());
         RecordingLogFrame* frame = frames.last();
@@ -426,7 +426,7 @@ private Q_SLOTS:
     {
         QList<QPointer<RecordingLogFrame>> frames;
         AppTestEnv env;
-        TLogform& w = env.window({}, test::recordingFactories(&frames));
+        TLogform& w = env.window({}, test::recordingFeatures(&frames));
         w.show();
         RecordingLogFrame* frame = frames.last();
         frame->calls.clear();
@@ -457,7 +457,7 @@ private Q_SLOTS:
     {
         QList<QPointer<RecordingLogFrame>> frames;
         AppTestEnv env;
-        TLogform& w = env.window({}, test::recordingFactories(&frames));
+        TLogform& w = env.window({}, test::recordingFeatures(&frames));
         w.show();
         QCOMPARE(frames.size(), 1);
         QCOMPARE(frames.last()->viewMode(), 0);

@@ -1,7 +1,7 @@
-#include "app/MainWindowFactories.h"
+#include "app/MainWindowFeatures.h"
+#include "db/SharedEngine.h"
 #include "platform/MonitorLink.h"
 #include "tests/support/MessageReceiver.h"
-#include "db/SharedEngine.h"
 #include "app/TLogform.h"
 #include "tests/TestPaths.h"
 #include "tests/app/AppTestEnv.h"
@@ -112,8 +112,10 @@ private Q_SLOTS:
         QVERIFY2(QFileInfo::exists(rufwarteProgram()), "the rufwarte program is missing from the build");
         AppTestEnv env;
         env.addCall(1, QStringLiteral("2024-05-14"), QStringLiteral("0301111"));
-        MainWindowFactories f = defaultMainWindowFactories();
-        f.contactEditWindow = [](QWidget*, int, int) -> QWidget* { return new QWidget; };
+        std::vector<MainWindowFeature> f = defaultMainWindowFeatures();
+        f.push_back([](TLogform& mainWindow) {
+            mainWindow.factories().contactEditWindow = [](QWidget*, int, int) -> QWidget* { return new QWidget; };
+        });
         TLogform& w = env.window({}, f);
         w.show();
         QTRY_COMPARE(w.statusPanels()->panelText(2), QStringLiteral("Protokolleinträge: 1"));

@@ -1,9 +1,11 @@
+#include "app/ActionRegistry.h"
 #include "app/SlotRegistry.h"
 #include "tests/support/TestRegistry.h"
 #include "ui/calendar/PlannerCalendar.h"
 #include "ui/navbar/AdvNavBar.h"
 #include "ui/statusbar/PanelStatusBar.h"
 
+#include <QAction>
 #include <QHelpEvent>
 #include <QSignalSpy>
 #include <QTest>
@@ -120,6 +122,45 @@ private Q_SLOTS:
         slots.clear();
         QVERIFY(slots.allFree());
         QCoreApplication::sendPostedEvents(nullptr, QEvent::DeferredDelete);
+    }
+
+    void actionsRunOnlyWhileTheirRuleAllows()
+    {
+        QObject owner;
+        ActionRegistry actions(&owner);
+        bool allowed = false;
+        int runs = 0;
+        QAction* ruled =
+            actions.add(QStringLiteral("ruled"), QStringLiteral("Regel"), [&] { ++runs; }, [&] { return allowed; });
+        QAction* declared = actions.add(QStringLiteral("declared"), QStringLiteral("Ohne"));
+        QCOMPARE(declared->text(), QStringLiteral("Ohne"));
+        actions.update();
+        QVERIFY(!ruled->isEnabled());
+        QVERIFY(!declared->isEnabled()); // nobody gave it a handler yet
+
+        // A stale enabled state does not let a trigger through.
+        ruled->setEnabled(true);
+        ruled->trigger();
+        QCOMPARE(runs, 0);
+        QVERIFY(!ruled->isEnabled());
+        allowed = true;
+        actions.runIfEnabled(QStringLiteral("ruled"));
+        QCOMPARE(runs, 1);
+
+        // A feature gives the declared action its behaviour; without a rule it is always enabled.
+        int featureRuns = 0;
+        actions.define(QStringLiteral("declared"), [&] { ++featureRuns; });
+        actions.update();
+        QVERIFY(declared->isEnabled());
+        declared->trigger();
+        QCOMPARE(featureRuns, 1);
+        QVERIFY(!actions.find(QStringLiteral("unknown")));
+
+        // Once frozen, the rules are no longer asked.
+        actions.freeze();
+        allowed = false;
+        actions.update();
+        QVERIFY(ruled->isEnabled());
     }
 };
 

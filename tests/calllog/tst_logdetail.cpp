@@ -45,8 +45,7 @@ void click(const TLogDetailForm& w, const char* button)
 // A detail window on one call, shown as the host shows it.
 std::unique_ptr<TLogDetailForm> openWindow(LogTestEnv& env, int lid, int tag = 3)
 {
-    auto w = std::make_unique<TLogDetailForm>(&env.dm());
-    w->setLogId(lid);
+    auto w = std::make_unique<TLogDetailForm>(&env.dm(), lid);
     w->setHostWindow(&env.host());
     w->setTag(tag);
     w->show();
@@ -80,6 +79,7 @@ private Q_SLOTS:
     void failedLoadLocksTheSaves();
     void recordDeletedWhileOpen();
     void databaseGoneWhileEditing();
+    void showsTheCallItWasGiven();
     void noticeDialogs();
 };
 
@@ -272,6 +272,32 @@ void TstLogDetail::databaseGoneWhileEditing()
     QCOMPARE(edit(*w)->text(), QStringLiteral("ungespeichert"));
     env.host().flush();
     QVERIFY(env.host().of(WMCLOSELOGDETAILFORM).isEmpty());
+}
+
+void TstLogDetail::showsTheCallItWasGiven()
+{
+    LogTestEnv env;
+    addFullCall(env);
+    env.addCall(11, "'2024-05-15'", "'09:00:00'", "'Schulz'", "'0402222'");
+    env.dm().CurLogLID = 11; // the log list has another call focused
+    {
+        auto w = openWindow(env, 10);
+        QCOMPARE(w->logId(), 10);
+        QCOMPARE(vl(*w, 3), QStringLiteral("Meier, Hans"));
+        edit(*w)->setText(QStringLiteral("neu"));
+        click(*w, "RzB2");
+        QCOMPARE(remarkOf(env, 10).toString(), QStringLiteral("neu"));
+        QVERIFY(remarkOf(env, 11).isNull());
+    }
+    // Without a data module there is no connection: reported, nothing shown, nothing to save.
+    TLogDetailForm w(nullptr, 10);
+    w.setHostWindow(&env.host());
+    w.show();
+    QCOMPARE(env.dialogs().last().text, QStringLiteral("# DM2 - DBConnect\r\nKeine Verbindung zur Datenbank!"));
+    QVERIFY(w.savesLocked());
+    QCOMPARE(vl(w, 3), QStringLiteral("-"));
+    QVERIFY(!w.SetBemerkung());
+    QCOMPARE(remarkOf(env, 10).toString(), QStringLiteral("neu"));
 }
 
 void TstLogDetail::noticeDialogs()

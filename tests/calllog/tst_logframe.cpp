@@ -84,6 +84,7 @@ private Q_SLOTS:
     void columnMenuFollowsVisibility();
     void dayModeAndRefresh();
     void databaseGoneKeepsTheFrameUsable();
+    void withoutADataModuleNothingIsRead();
 };
 
 void TstLogFrame::newFrameShowsWholeLogNewestFirst()
@@ -545,6 +546,23 @@ void TstLogFrame::databaseGoneKeepsTheFrameUsable()
     QCOMPARE(lastStatus(env), 0);
     QVERIFY(!again.OpenDBonDay(QDate(2024, 5, 15)));
     QVERIFY(env.dialogs().last().text.startsWith(QStringLiteral("# Logframe - OpenDBonDay")));
+}
+
+void TstLogFrame::withoutADataModuleNothingIsRead()
+{
+    LogTestEnv env;
+    fillCalls(env);
+    env.dm().CurLogLID = 3; // a connected module with a focused call exists in the process
+    Tlogframe f(nullptr);
+    QVERIFY(f.Firstep(&env.host()));
+    QCOMPARE(env.dialogs().count(), 1);
+    QVERIFY(env.dialogs().last().text.startsWith(QStringLiteral("# Logframe - Firstep")));
+    QCOMPARE(f.controller()->rowCount(), 0);
+    QCOMPARE(f.CurrentLogLID(), -1);
+    QVERIFY(!action(f, "lf_bemerkung")->isEnabled());
+    QVERIFY(!f.OpenDBonDay(QDate(2024, 5, 15)));
+    QVERIFY(env.dialogs().last().text.startsWith(QStringLiteral("# Logframe - OpenDBonDay")));
+    QVERIFY(!env.dm().ibcds_log.isActive());
 }
 
 ORVANTA_TEST(TstLogFrame)

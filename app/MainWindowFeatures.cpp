@@ -1,0 +1,13 @@
+#include "app/MainWindowFeatures.h"
+
+#include "app/CallLogFeature.h"
+
+namespace orvanta {
+
+std::vector<MainWindowFeature> defaultMainWindowFeatures()
+{
+    // A view whose frame no feature provides shows an empty frame.
+    return {registerCallLogFeature};
+}
+
+} // namespace orvanta
