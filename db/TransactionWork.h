@@ -1,7 +1,6 @@
 #pragma once
 // One way to run a unit of work on the database: all of it in one transaction or none of it, and
-// a failure reported under the caller's label. Every window that writes or reads through one of
-// the data module's transactions uses it:
+// a failure reported under the caller's label. The windows run their statements through it:
 //
 //   const bool saved = runInTransaction(m_dm->LogDetailTS, QStringLiteral("# LogDetailForm - SetBemerkung"), [&] {
 //       query.setCommandText(QString::fromLatin1(logsql::kUpdateRemark));
