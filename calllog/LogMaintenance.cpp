@@ -1,9 +1,11 @@
 #include "calllog/LogMaintenance.h"
 
 #include "calllog/LogConnection.h"
+#include "calllog/LogStatements.h"
 #include "db/FbStatement.h"
 #include "db/FbTransaction.h"
 #include "db/TDM2.h"
+#include "db/TransactionWork.h"
 #include "ui/dialogs/BusyCursor.h"
 #include "platform/Clock.h"
 #include "platform/DialogService.h"
@@ -22,16 +24,6 @@ const QString kDateFormat = QStringLiteral("dd.MM.yyyy");
 bool connected(TDM2* dm)
 {
     return logDatabaseConnected(dm);
-}
-
-// A failed operation leaves nothing open or half-done behind and says what went wrong.
-template <typename Query>
-bool abandon(Query& query, FbTransaction& tx, const QString& failure, const std::exception& e)
-{
-    query.close();
-    tx.rollbackQuietly();
-    reportError(failure, &e);
-    return false;
 }
 
 // Keeps the calendar from repainting while its marks change.
@@ -75,17 +67,16 @@ bool LogMaintenance::gettinglogdates(PlannerCalendar& calendar)
     BusyCursor busy;
     calendar.clearEvents();
     std::lock_guard guard(processLock());
-    FbTransaction& tx = m_dm->LogAllgemeinTS;
+    const QString failure = QStringLiteral("# Orvanta - gettinglogdates\r\nTabelle konnte nicht geöffnet werden!\r\n"
+                                           "Vorhandene Protokolleinträge konnten nicht ermittelt werden.");
     DataSet& query = m_dm->LogAllgemeinQuery;
-    try {
+    bool unopened = false;
+    const bool ok = runInTransaction(m_dm->LogAllgemeinTS, failure, [&] {
         query.close();
-        query.setCommandText(QStringLiteral("SELECT DISTINCT TSDATE FROM LOG"));
-        TDM2::restart(tx);
+        query.setCommandText(QString::fromLatin1(logsql::kSelectLogDays));
         query.open();
         if (!query.isActive()) {
-            tx.rollbackQuietly();
-            reportError(QStringLiteral("# Orvanta - gettinglogdates\r\nTabelle konnte nicht geöffnet werden!\r\n"
-                                       "Vorhandene Protokolleinträge konnten nicht ermittelt werden."));
+            unopened = true;
             return false;
         }
         for (query.first(); !query.eof(); query.next()) {
@@ -95,15 +86,12 @@ bool LogMaintenance::gettinglogdates(PlannerCalendar& calendar)
             const QDate day = field.asDate();
             calendar.addEvent(day, QStringLiteral("Protokoll vom ") + day.toString(kDateFormat));
         }
-        query.close();
-        TDM2::commitIfActive(tx);
         return true;
-    } catch (const std::exception& e) {
-        return abandon(query, tx,
-                       QStringLiteral("# Orvanta - gettinglogdates\r\nTabelle konnte nicht geöffnet werden!\r\n"
-                                      "Vorhandene Protokolleinträge konnten nicht ermittelt werden."),
-                       e);
-    }
+    });
+    query.close();
+    if (unopened)
+        reportError(failure);
+    return ok;
 }
 
 bool LogMaintenance::markLogDays(int mode, const LogMarkContext& context)
@@ -146,33 +134,29 @@ bool LogMaintenance::deleteWhere(const QString& sql, const QString& param, const
         return false;
     BusyCursor busy;
     std::lock_guard guard(processLock());
-    FbTransaction& tx = m_dm->LogAllgemeinTS;
     DataSet& query = m_dm->LogAllgemeinQuery;
-    try {
+    const bool ok = runInTransaction(m_dm->LogAllgemeinTS, label, [&] {
         query.close();
         query.setCommandText(sql);
         query.setParam(param, value);
-        TDM2::restart(tx);
         query.execSQL();
-        if (mainWindow)
-            postMessage(mainWindow, WMUPDATEVOICEBOXGRID, 0, 0);
-        query.close();
-        tx.commit();
-        return true;
-    } catch (const std::exception& e) {
-        return abandon(query, tx, label, e);
-    }
+    });
+    query.close();
+    // The main window re-reads the log once the deletion is committed.
+    if (ok && mainWindow)
+        postMessage(mainWindow, WMUPDATEVOICEBOXGRID, 0, 0);
+    return ok;
 }
 
 bool LogMaintenance::DeleteLogItem(int lid, QObject* mainWindow)
 {
-    return deleteWhere(QStringLiteral("DELETE FROM LOG WHERE LID = :ID"), QStringLiteral("ID"), lid,
+    return deleteWhere(QString::fromLatin1(logsql::kDeleteLogRecord), QStringLiteral("ID"), lid,
                        QStringLiteral("# Orvanta - DeleteLogItem"), mainWindow);
 }
 
 bool LogMaintenance::DeleteLogDay(QDate day, QObject* mainWindow)
 {
-    return deleteWhere(QStringLiteral("DELETE FROM LOG WHERE TSDATE = :DT"), QStringLiteral("DT"), day,
+    return deleteWhere(QString::fromLatin1(logsql::kDeleteLogDay), QStringLiteral("DT"), day,
                        QStringLiteral("# Orvanta - DeleteLogDay"), mainWindow);
 }
 
@@ -183,35 +167,27 @@ bool LogMaintenance::GetFromphoneByLog(int lid, QString& number)
         return false;
     const QString head = QStringLiteral("# Orvanta - GetFromphoneByLog\r\n");
     const QString tail = QStringLiteral("\r\nAufgabe kann nicht durchgeführt werden.");
-    FbTransaction& tx = m_dm->GetFromTS;
+    const QString unopened = QStringLiteral("Eine benötigte Tabelle konnte nicht geöffnet werden!");
     DataSet& query = m_dm->GetFromNr;
-    try {
+    QString failure;
+    const bool ok = runInTransaction(m_dm->GetFromTS, head + unopened + tail, [&] {
         query.close();
-        TDM2::restart(tx);
         query.setParam(QStringLiteral("ID"), lid);
         query.open();
-        QString failure;
         if (!query.isActive())
-            failure = QStringLiteral("Eine benötigte Tabelle konnte nicht geöffnet werden!");
+            failure = unopened;
         else if (query.rowCount() < 1)
             failure = QStringLiteral("Der Protokolleintrag konnte in der Datenbank nicht gefunden werden!");
         else if ((number = (query.first(), query.fieldByName(u"FROMPHONE").asString())).isEmpty())
             failure = QStringLiteral("Die Telefonnummer des Anrufers im Protokolleintrag ist leer!");
-        query.close();
-        TDM2::commitIfActive(tx);
-        if (!failure.isEmpty()) {
-            number.clear();
-            reportError(head + failure + tail);
-            return false;
-        }
+    });
+    query.close();
+    if (ok && failure.isEmpty())
         return true;
-    } catch (const std::exception& e) {
-        query.close();
-        tx.rollbackQuietly();
-        number.clear();
-        reportError(head + QStringLiteral("Eine benötigte Tabelle konnte nicht geöffnet werden!") + tail, &e);
-        return false;
-    }
+    number.clear();
+    if (ok)
+        reportError(head + failure + tail);
+    return false;
 }
 
 int LogMaintenance::CheckOfNumber(const QString& number)
@@ -220,26 +196,22 @@ int LogMaintenance::CheckOfNumber(const QString& number)
                                            "Die Bearbeitung wird abgebrochen.");
     if (!connected(m_dm))
         return 2;
-    FbTransaction& tx = m_dm->NumCheck_SQLTS;
     FbStatement& sql = m_dm->NumCheck_SQL;
     QString label;
     QString name;
     int key = 0;
-    try {
+    const bool ok = runInTransaction(m_dm->NumCheck_SQLTS, failure, [&] {
         sql.close();
-        sql.setSql(QStringLiteral("EXECUTE PROCEDURE P_SELECT_LOG_CONTACT(:PHONENR)"));
+        sql.setSql(QString::fromLatin1(logsql::kSelectLogContact));
         sql.setParam(QStringLiteral("PHONENR"), number);
-        TDM2::restart(tx);
         sql.execute();
         label = sql.isNull(1) ? QString() : sql.asString(1);
         name = sql.isNull(2) ? QString() : sql.asString(2);
         key = sql.isNull(3) ? 0 : sql.asInt(3);
-        sql.close();
-        tx.commit();
-    } catch (const std::exception& e) {
-        abandon(sql, tx, failure, e);
+    });
+    sql.close();
+    if (!ok)
         return 2;
-    }
     if (key <= 0)
         return 0;
     BusyCursor::resetCursor();
@@ -259,21 +231,17 @@ bool LogMaintenance::LogCheckOfNumber(const QString& number)
 {
     if (!connected(m_dm))
         return false;
-    FbTransaction& tx = m_dm->NumCheck_SQLTS;
     FbStatement& sql = m_dm->NumCheck_SQL;
-    try {
+    bool found = false;
+    const bool ok = runInTransaction(m_dm->NumCheck_SQLTS, QStringLiteral("# Orvanta - LogCheckOfNumber"), [&] {
         sql.close();
-        sql.setSql(QStringLiteral("EXECUTE PROCEDURE P_GET_COUNT_OF_NUMBER(:PN)"));
+        sql.setSql(QString::fromLatin1(logsql::kCountOfNumber));
         sql.setParam(QStringLiteral("PN"), number);
-        TDM2::restart(tx);
         sql.execute();
-        const bool found = !sql.isNull(0) && sql.asInt64(0) > 0;
-        sql.close();
-        tx.commit();
-        return found;
-    } catch (const std::exception& e) {
-        return abandon(sql, tx, QStringLiteral("# Orvanta - LogCheckOfNumber"), e);
-    }
+        found = !sql.isNull(0) && sql.asInt64(0) > 0;
+    });
+    sql.close();
+    return ok && found;
 }
 
 bool LogMaintenance::LogbuchAnpassen(const QString& number, const QString& numberLabel, int contactKey,
@@ -281,28 +249,19 @@ bool LogMaintenance::LogbuchAnpassen(const QString& number, const QString& numbe
 {
     if (!connected(m_dm))
         return false;
-    FbTransaction& tx = m_dm->NumCheck_SQLTS;
+    const QString failure = QStringLiteral("# Orvanta - LogbuchAnpassen\r\nLogbuch konnte nicht angepasst werden!\r\n"
+                                           "Die Bearbeitung wird abgebrochen.");
     FbStatement& sql = m_dm->NumCheck_SQL;
-    try {
+    return runInTransaction(m_dm->NumCheck_SQLTS, failure, [&] {
         sql.close();
-        sql.setSql(QStringLiteral("UPDATE LOG SET FROMBEZ = :FB,FROMANSCHLUSS = :FA,CID = :C "
-                                  "WHERE (FROMPHONE = :FP)or(FROMSUBB = :FS)"));
+        sql.setSql(QString::fromLatin1(logsql::kRelinkLog));
         sql.setParam(QStringLiteral("FB"), contactName);
         sql.setParam(QStringLiteral("FA"), numberLabel);
         sql.setParam(QStringLiteral("C"), contactKey);
         sql.setParam(QStringLiteral("FP"), number);
         sql.setParam(QStringLiteral("FS"), number);
-        TDM2::restart(tx);
         sql.execute();
-        tx.commit();
-        return true;
-    } catch (const std::exception& e) {
-        tx.rollbackQuietly();
-        reportError(QStringLiteral("# Orvanta - LogbuchAnpassen\r\nLogbuch konnte nicht angepasst werden!\r\n"
-                                   "Die Bearbeitung wird abgebrochen."),
-                    &e);
-        return false;
-    }
+    });
 }
 
 } // namespace orvanta

@@ -1,7 +1,9 @@
 #include "calllog/TLogDetailForm.h"
 
 #include "calllog/LogConnection.h"
+#include "calllog/LogStatements.h"
 #include "db/TDM2.h"
+#include "db/TransactionWork.h"
 #include "phone/PhoneNumbers.h"
 #include "ui/dialogs/BusyCursor.h"
 #include "platform/DialogService.h"
@@ -209,22 +211,23 @@ bool TLogDetailForm::GetLogDSData()
         return false;
     BusyCursor busy;
     DataSet& q = m_dm->LogDetailQuery;
-    FbTransaction& ts = m_dm->LogDetailTS;
-    bool result = false;
-    try {
-        ts.rollbackQuietly();
-        q.close();
-        q.setCommandText(QStringLiteral("SELECT * FROM LOG WHERE LID = :ID"));
-        q.setParam(QStringLiteral("ID"), m_logId);
-        ts.start();
-        q.open();
-        if (!q.isActive()) {
-            ts.rollbackQuietly();
-            logError(kLabel + QStringLiteral("GetLogDSData\r\nAuf die Tabelle konnte nicht zugegriffen werden."));
-        } else if (q.rowCount() == 0) {
-            ts.rollbackQuietly();
-            logError(kLabel + QStringLiteral("GetLogDSData\r\nDer Datensatz konnte nicht ermittelt werden."));
-        } else {
+    const QString label = kLabel + QStringLiteral("GetLogDSData");
+    QString refusal;
+    const bool loaded = runInTransaction(
+        m_dm->LogDetailTS, label,
+        [&] {
+            q.close();
+            q.setCommandText(QString::fromLatin1(logsql::kSelectLogRecord));
+            q.setParam(QStringLiteral("ID"), m_logId);
+            q.open();
+            if (!q.isActive()) {
+                refusal = QStringLiteral("Auf die Tabelle konnte nicht zugegriffen werden.");
+                return false;
+            }
+            if (q.rowCount() == 0) {
+                refusal = QStringLiteral("Der Datensatz konnte nicht ermittelt werden.");
+                return false;
+            }
             q.first();
             const auto field = [&q](const char* name) -> std::optional<DataSetField> {
                 const QString n = QString::fromLatin1(name);
@@ -287,18 +290,13 @@ bool TLogDetailForm::GetLogDSData()
                 const QLocale locale = QLocale::system();
                 m_vl[20]->setText(locale.toCurrencyString(k->asFloat(), locale.currencySymbol(), 2));
             }
-            result = true;
-        }
-        q.close();
-        if (ts.isActive())
-            ts.commit();
-    } catch (const std::exception& e) {
-        result = false;
-        ts.rollbackQuietly();
-        q.close();
-        logError(kLabel + QStringLiteral("GetLogDSData"), &e);
-    }
-    return result;
+            return true;
+        },
+        ErrorReport::Log);
+    q.close();
+    if (!refusal.isEmpty())
+        logError(label + QStringLiteral("\r\n") + refusal);
+    return loaded;
 }
 
 bool TLogDetailForm::SetBemerkung()
@@ -307,33 +305,29 @@ bool TLogDetailForm::SetBemerkung()
         return false;
     BusyCursor busy;
     DataSet& q = m_dm->LogDetailQuery;
-    FbTransaction& ts = m_dm->LogDetailTS;
-    try {
-        ts.rollbackQuietly();
-        q.close();
-        q.setCommandText(QStringLiteral("UPDATE LOG SET BEMERK = :BEM WHERE LID = :ID"));
-        q.setParam(QStringLiteral("BEM"), m_rzE1->text().left(kRemarkLength));
-        q.setParam(QStringLiteral("ID"), m_logId);
-        ts.start();
-        if (q.execSQL() == 0) {
-            // The call was deleted meanwhile (the monitor or the maintenance): nothing was saved,
-            // and saying otherwise would lose the user's text without a word.
-            ts.rollbackQuietly();
-            reportError(kLabel + QStringLiteral("SetBemerkung\r\nDer Protokolleintrag existiert nicht mehr. "
-                                                "Die Bemerkung wurde nicht gespeichert."));
-            return false;
-        }
-        postMessage(m_host, WMLOGINFOCHANGE, m_logId, 1);
-        q.close();
-        if (ts.isActive())
-            ts.commit();
-        return true;
-    } catch (const std::exception& e) {
-        q.close();
-        ts.rollbackQuietly();
-        logError(kLabel + QStringLiteral("SetBemerkung"), &e);
-        return false;
+    bool gone = false;
+    const bool saved = runInTransaction(
+        m_dm->LogDetailTS, kLabel + QStringLiteral("SetBemerkung"),
+        [&] {
+            q.close();
+            q.setCommandText(QString::fromLatin1(logsql::kUpdateRemark));
+            q.setParam(QStringLiteral("BEM"), m_rzE1->text().left(kRemarkLength));
+            q.setParam(QStringLiteral("ID"), m_logId);
+            gone = q.execSQL() == 0;
+            return !gone;
+        },
+        ErrorReport::Log);
+    q.close();
+    if (gone) {
+        // The call was deleted meanwhile (the monitor or the maintenance): nothing was saved,
+        // and saying otherwise would lose the user's text without a word.
+        reportError(kLabel + QStringLiteral("SetBemerkung\r\nDer Protokolleintrag existiert nicht mehr. "
+                                            "Die Bemerkung wurde nicht gespeichert."));
     }
+    // The host re-reads the call once the remark is committed.
+    if (saved)
+        postMessage(m_host, WMLOGINFOCHANGE, m_logId, 1);
+    return saved;
 }
 
 // A save that worked makes the text the saved remark; one that failed keeps the edit pending,

@@ -1,8 +1,11 @@
 #include "calllog/Tlogframe.h"
 
 #include "calllog/LogImages.h"
+#include "calllog/LogStatements.h"
 #include "calllog/RecordStoreGridSource.h"
 #include "db/TDM2.h"
+#include "db/TDM2Statements.h"
+#include "db/TransactionWork.h"
 #include "phone/PhoneNumbers.h"
 #include "platform/AppException.h"
 #include "ui/dialogs/BusyCursor.h"
@@ -414,18 +417,18 @@ bool Tlogframe::Firstep(QObject* host)
                 throw AppException(QStringLiteral("Kein Datenmodul vorhanden."));
             DataSet& log = m_dm->ibcds_log;
             log.close();
-            log.setCommandText(QStringLiteral("SELECT * FROM LOG"));
+            log.setCommandText(QString::fromLatin1(dmsql::kSelectLog));
             log.open();
             bindSource();
             if (log.isActive())
                 m_layouts->restore(*controller(), 0);
             EnsureSorting();
         } catch (const std::exception& e) {
-            if (m_dm)
-                m_dm->logts.rollbackQuietly();
+            // The list's transaction stays open while the list shows (its data set commits on
+            // closing), so only the failure path is shared with the other units of work.
             detachSource();
             BusyCursor::resetCursor();
-            reportError(kLabel + QStringLiteral("Firstep"), &e);
+            rollbackAndReport(m_dm ? &m_dm->logts : nullptr, kLabel + QStringLiteral("Firstep"), e);
         }
     } else if (m_viewMode == 1) {
         if (OpenDBonDay(m_logDay) && m_dm && m_dm->ibcds_log.isActive()) {
@@ -469,7 +472,7 @@ bool Tlogframe::OpenDBonDay(QDate day)
                 throw AppException(QStringLiteral("Kein Datenmodul vorhanden."));
             DataSet& log = m_dm->ibcds_log;
             log.close();
-            log.setCommandText(QStringLiteral("SELECT * FROM LOG WHERE TSDATE = :TSD"));
+            log.setCommandText(QString::fromLatin1(logsql::kSelectLogOfDay));
             log.setParam(QStringLiteral("TSD"), day.isValid() ? QVariant(day) : QVariant(QMetaType(QMetaType::QDate)));
             log.open();
             bindSource();
@@ -479,11 +482,9 @@ bool Tlogframe::OpenDBonDay(QDate day)
             EnsureSorting();
         } catch (const std::exception& e) {
             ok = false;
-            if (m_dm)
-                m_dm->logts.rollbackQuietly();
             detachSource();
             BusyCursor::resetCursor();
-            reportError(kLabel + QStringLiteral("OpenDBonDay"), &e);
+            rollbackAndReport(m_dm ? &m_dm->logts : nullptr, kLabel + QStringLiteral("OpenDBonDay"), e);
         }
     }
     PostLogStatus();

@@ -44,6 +44,22 @@ auto guard(F&& f, const QString& context = {}) -> decltype(f())
     }
 }
 
+// The same, running onFailure first when f throws anything: for releasing the handles f had
+// acquired before the failure. onFailure must not throw.
+template <typename F, typename Cleanup>
+auto guard(F&& f, const QString& context, Cleanup&& onFailure) -> decltype(f())
+{
+    try {
+        return f();
+    } catch (const Firebird::FbException& e) {
+        onFailure();
+        throw toError(e, context);
+    } catch (...) {
+        onFailure();
+        throw;
+    }
+}
+
 [[nodiscard]] inline QString decodeText(const char* data, qsizetype size) { return decodeDbText(data, size); }
 [[nodiscard]] inline QByteArray encodeText(QStringView text) { return encodeDbText(text); }
 

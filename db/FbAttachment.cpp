@@ -119,32 +119,27 @@ void FbAttachment::connect()
         throw DatabaseError(QStringLiteral("Database name is empty"));
     fbapi::Status st;
     IXpbBuilder* dpb = nullptr;
-    try {
-        dpb = fbapi::util()->getXpbBuilder(&st, IXpbBuilder::DPB, nullptr, 0);
-        fillDpb(dpb, &st, d->params);
-        // A server that does not answer must not hold the program for the client's default
-        // three minutes.
-        if (!dpb->findFirst(&st, isc_dpb_connect_timeout))
-            dpb->insertInt(&st, isc_dpb_connect_timeout, kConnectTimeoutSeconds);
-        IProvider* provider = fbapi::master()->getDispatcher();
-        try {
-            d->handle = provider->attachDatabase(&st, dbName(d->databaseName).constData(),
-                                                 dpb->getBufferLength(&st), dpb->getBuffer(&st));
-        } catch (...) {
-            provider->release();
-            throw;
-        }
-        provider->release();
-        dpb->dispose();
-    } catch (const FbException& e) {
-        if (dpb)
-            dpb->dispose();
-        throw fbapi::toError(e);
-    } catch (...) {
-        if (dpb)
-            dpb->dispose();
-        throw;
-    }
+    IProvider* provider = nullptr;
+    guard(
+        [&] {
+            dpb = fbapi::util()->getXpbBuilder(&st, IXpbBuilder::DPB, nullptr, 0);
+            fillDpb(dpb, &st, d->params);
+            // A server that does not answer must not hold the program for the client's default
+            // three minutes.
+            if (!dpb->findFirst(&st, isc_dpb_connect_timeout))
+                dpb->insertInt(&st, isc_dpb_connect_timeout, kConnectTimeoutSeconds);
+            provider = fbapi::master()->getDispatcher();
+            d->handle = provider->attachDatabase(&st, dbName(d->databaseName).constData(), dpb->getBufferLength(&st),
+                                                 dpb->getBuffer(&st));
+        },
+        {}, [&] {
+            if (provider)
+                provider->release();
+            if (dpb)
+                dpb->dispose();
+        });
+    provider->release();
+    dpb->dispose();
 }
 
 void FbAttachment::disconnect()
@@ -157,12 +152,7 @@ void FbAttachment::disconnect()
     IAttachment* handle = d->handle;
     d->handle = nullptr;
     fbapi::Status st;
-    try {
-        handle->detach(&st);
-    } catch (const FbException& e) {
-        handle->release();
-        throw fbapi::toError(e);
-    }
+    guard([&] { handle->detach(&st); }, {}, [handle] { handle->release(); });
 }
 
 void FbAttachment::executeImmediate(const QString& sql, FbTransaction& transaction)
@@ -173,11 +163,8 @@ void FbAttachment::executeImmediate(const QString& sql, FbTransaction& transacti
         throw DatabaseError(QStringLiteral("Transaction is not active"), {}, 0, sql);
     const QByteArray text = fbapi::encodeText(sql);
     fbapi::Status st;
-    try {
-        att->execute(&st, tra, 0, text.constData(), SQL_DIALECT_V6, nullptr, nullptr, nullptr, nullptr);
-    } catch (const FbException& e) {
-        throw fbapi::toError(e, sql);
-    }
+    guard([&] { att->execute(&st, tra, 0, text.constData(), SQL_DIALECT_V6, nullptr, nullptr, nullptr, nullptr); },
+          sql);
 }
 
 void FbAttachment::createDatabase(const QString& databaseName, const QString& user, const QString& password,
@@ -186,25 +173,27 @@ void FbAttachment::createDatabase(const QString& databaseName, const QString& us
     fbapi::Status st;
     IXpbBuilder* dpb = nullptr;
     IProvider* provider = fbapi::master()->getDispatcher();
-    try {
-        dpb = fbapi::util()->getXpbBuilder(&st, IXpbBuilder::DPB, nullptr, 0);
-        fillDpb(dpb, &st, {QStringLiteral("user_name=") + user, QStringLiteral("password=") + password,
-                           QStringLiteral("lc_ctype=ISO8859_1")});
-        dpb->insertInt(&st, isc_dpb_page_size, pageSize);
-        dpb->insertInt(&st, isc_dpb_sql_dialect, 3);
-        dpb->insertString(&st, isc_dpb_set_db_charset, "ISO8859_1");
-        dpb->insertInt(&st, isc_dpb_force_write, forcedWrites ? 1 : 0);
-        IAttachment* att = provider->createDatabase(&st, dbName(databaseName).constData(), dpb->getBufferLength(&st),
-                                                    dpb->getBuffer(&st));
-        att->detach(&st);
-        dpb->dispose();
-        provider->release();
-    } catch (const FbException& e) {
-        if (dpb)
-            dpb->dispose();
-        provider->release();
-        throw fbapi::toError(e);
-    }
+    guard(
+        [&] {
+            dpb = fbapi::util()->getXpbBuilder(&st, IXpbBuilder::DPB, nullptr, 0);
+            fillDpb(dpb, &st,
+                    {QStringLiteral("user_name=") + user, QStringLiteral("password=") + password,
+                     QStringLiteral("lc_ctype=ISO8859_1")});
+            dpb->insertInt(&st, isc_dpb_page_size, pageSize);
+            dpb->insertInt(&st, isc_dpb_sql_dialect, 3);
+            dpb->insertString(&st, isc_dpb_set_db_charset, "ISO8859_1");
+            dpb->insertInt(&st, isc_dpb_force_write, forcedWrites ? 1 : 0);
+            IAttachment* att = provider->createDatabase(&st, dbName(databaseName).constData(),
+                                                        dpb->getBufferLength(&st), dpb->getBuffer(&st));
+            att->detach(&st);
+        },
+        {}, [&] {
+            if (dpb)
+                dpb->dispose();
+            provider->release();
+        });
+    dpb->dispose();
+    provider->release();
 }
 
 void FbAttachment::dropDatabase()
@@ -215,12 +204,7 @@ void FbAttachment::dropDatabase()
     d->releaseDependents();
     fbapi::Status st;
     d->handle = nullptr;
-    try {
-        att->dropDatabase(&st);
-    } catch (const FbException& e) {
-        att->release();
-        throw fbapi::toError(e);
-    }
+    guard([&] { att->dropDatabase(&st); }, {}, [att] { att->release(); });
 }
 
 } // namespace orvanta

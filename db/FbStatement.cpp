@@ -465,21 +465,18 @@ void FbStatement::prepare()
     ITransaction* tra = d->requireTransaction();
     const QByteArray text = fbapi::encodeText(d->parsed.sql);
     fbapi::Status st;
-    try {
-        d->stmt = att->prepare(&st, tra, 0, text.constData(), SQL_DIALECT_V6, IStatement::PREPARE_PREFETCH_METADATA);
-        d->stmtType = d->stmt->getType(&st);
-        d->inMeta = d->stmt->getInputMetadata(&st);
-        d->outMeta = d->stmt->getOutputMetadata(&st);
-        if (d->inMeta->getCount(&st) != d->paramOf.size())
-            throw DatabaseError(QStringLiteral("Parameter count mismatch"), {}, 0, d->sql);
-        d->describeOutput(&st);
-    } catch (const FbException& e) {
-        d->releaseAll();
-        throw fbapi::toError(e, d->sql);
-    } catch (...) {
-        d->releaseAll();
-        throw;
-    }
+    fbapi::guard(
+        [&] {
+            d->stmt = att->prepare(&st, tra, 0, text.constData(), SQL_DIALECT_V6,
+                                   IStatement::PREPARE_PREFETCH_METADATA);
+            d->stmtType = d->stmt->getType(&st);
+            d->inMeta = d->stmt->getInputMetadata(&st);
+            d->outMeta = d->stmt->getOutputMetadata(&st);
+            if (d->inMeta->getCount(&st) != d->paramOf.size())
+                throw DatabaseError(QStringLiteral("Parameter count mismatch"), {}, 0, d->sql);
+            d->describeOutput(&st);
+        },
+        d->sql, [this] { d->releaseAll(); });
 }
 
 QStringList FbStatement::paramNames() const { return d->names; }
@@ -586,22 +583,22 @@ void FbStatement::execute()
     d->releaseCursor();
     ITransaction* tra = d->requireTransaction();
     fbapi::Status st;
-    try {
-        IMessageMetadata* in = d->paramOf.empty() ? nullptr : d->buildInput(&st, tra);
-        void* inBuf = in ? d->inBuf.data() : nullptr;
-        d->affected = 0;
-        if (d->stmtType == isc_info_sql_stmt_select || d->stmtType == isc_info_sql_stmt_select_for_upd) {
-            d->cursor = d->stmt->openCursor(&st, tra, in, inBuf, d->outMeta, 0);
-        } else {
-            const bool outputs = !d->columns.empty();
-            d->stmt->execute(&st, tra, in, inBuf, outputs ? d->outMeta : nullptr, outputs ? d->outBuf.data() : nullptr);
-            d->hasRow = outputs;
-            d->affected = qint64(d->stmt->getAffectedRecords(&st));
-        }
-    } catch (const FbException& e) {
-        d->releaseCursor();
-        throw fbapi::toError(e, d->sql);
-    }
+    fbapi::guard(
+        [&] {
+            IMessageMetadata* in = d->paramOf.empty() ? nullptr : d->buildInput(&st, tra);
+            void* inBuf = in ? d->inBuf.data() : nullptr;
+            d->affected = 0;
+            if (d->stmtType == isc_info_sql_stmt_select || d->stmtType == isc_info_sql_stmt_select_for_upd) {
+                d->cursor = d->stmt->openCursor(&st, tra, in, inBuf, d->outMeta, 0);
+            } else {
+                const bool outputs = !d->columns.empty();
+                d->stmt->execute(&st, tra, in, inBuf, outputs ? d->outMeta : nullptr,
+                                 outputs ? d->outBuf.data() : nullptr);
+                d->hasRow = outputs;
+                d->affected = qint64(d->stmt->getAffectedRecords(&st));
+            }
+        },
+        d->sql, [this] { d->releaseCursor(); });
 }
 
 bool FbStatement::next()
@@ -611,14 +608,12 @@ bool FbStatement::next()
         return false;
     }
     fbapi::Status st;
-    try {
-        if (d->cursor->fetchNext(&st, d->outBuf.data()) == IStatus::RESULT_OK) {
-            d->hasRow = true;
-            return true;
-        }
-    } catch (const FbException& e) {
-        d->releaseCursor();
-        throw fbapi::toError(e, d->sql);
+    const bool fetched = fbapi::guard(
+        [&] { return d->cursor->fetchNext(&st, d->outBuf.data()) == IStatus::RESULT_OK; }, d->sql,
+        [this] { d->releaseCursor(); });
+    if (fetched) {
+        d->hasRow = true;
+        return true;
     }
     d->releaseCursor();
     return false;
@@ -896,22 +891,24 @@ QByteArray FbStatement::readBlob(int index) const
     QByteArray out;
     fbapi::Status st;
     IBlob* blob = nullptr;
-    try {
-        blob = att->openBlob(&st, tra, &id, 0, nullptr);
-        char buffer[kBlobSegment];
-        for (;;) {
-            unsigned got = 0;
-            const int r = blob->getSegment(&st, sizeof buffer, buffer, &got);
-            if (r == IStatus::RESULT_NO_DATA)
-                break;
-            out.append(buffer, qsizetype(got));
-        }
-        blob->close(&st);
-    } catch (const FbException& e) {
-        if (blob)
-            blob->release();
-        throw fbapi::toError(e, d->sql);
-    }
+    fbapi::guard(
+        [&] {
+            blob = att->openBlob(&st, tra, &id, 0, nullptr);
+            char buffer[kBlobSegment];
+            for (;;) {
+                unsigned got = 0;
+                const int r = blob->getSegment(&st, sizeof buffer, buffer, &got);
+                if (r == IStatus::RESULT_NO_DATA)
+                    break;
+                out.append(buffer, qsizetype(got));
+            }
+            blob->close(&st); // releases the blob on success
+            blob = nullptr;
+        },
+        d->sql, [&blob] {
+            if (blob)
+                blob->release();
+        });
     return out;
 }
 

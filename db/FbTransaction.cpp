@@ -108,12 +108,10 @@ void FbTransaction::start()
     IAttachment* att = d->attachment->d_func()->require();
     const QByteArray tpb = d->buildTpb();
     fbapi::Status st;
-    try {
-        d->handle = att->startTransaction(&st, unsigned(tpb.size()),
-                                          reinterpret_cast<const unsigned char*>(tpb.constData()));
-    } catch (const FbException& e) {
-        throw fbapi::toError(e);
-    }
+    d->handle = fbapi::guard([&] {
+        return att->startTransaction(&st, unsigned(tpb.size()),
+                                     reinterpret_cast<const unsigned char*>(tpb.constData()));
+    });
 }
 
 void FbTransaction::commit()
@@ -122,12 +120,8 @@ void FbTransaction::commit()
         throw DatabaseError(QStringLiteral("Transaction is not active"));
     d->closeCursors();
     fbapi::Status st;
-    try {
-        d->handle->commit(&st); // releases the handle on success
-        d->handle = nullptr;
-    } catch (const FbException& e) {
-        throw fbapi::toError(e);
-    }
+    fbapi::guard([&] { d->handle->commit(&st); }); // releases the handle on success
+    d->handle = nullptr;
 }
 
 void FbTransaction::commitRetaining()
@@ -135,11 +129,7 @@ void FbTransaction::commitRetaining()
     if (!d->handle)
         throw DatabaseError(QStringLiteral("Transaction is not active"));
     fbapi::Status st;
-    try {
-        d->handle->commitRetaining(&st);
-    } catch (const FbException& e) {
-        throw fbapi::toError(e);
-    }
+    fbapi::guard([&] { d->handle->commitRetaining(&st); });
 }
 
 void FbTransaction::rollback()
@@ -148,16 +138,13 @@ void FbTransaction::rollback()
         throw DatabaseError(QStringLiteral("Transaction is not active"));
     d->closeCursors();
     fbapi::Status st;
-    try {
-        d->handle->rollback(&st);
-        d->handle = nullptr;
-    } catch (const FbException& e) {
-        // A rollback that fails leaves nothing to keep: the server ends the transaction anyway
-        // when the connection goes.
+    // A rollback that fails leaves nothing to keep: the server ends the transaction anyway when
+    // the connection goes.
+    fbapi::guard([&] { d->handle->rollback(&st); }, {}, [this] {
         d->handle->release();
         d->handle = nullptr;
-        throw fbapi::toError(e);
-    }
+    });
+    d->handle = nullptr; // released by the rollback
 }
 
 void FbTransaction::rollbackQuietly() noexcept

@@ -2,6 +2,7 @@
 
 #include "db/CredentialCipher.h"
 #include "db/DatabaseError.h"
+#include "db/TDM2Statements.h"
 #include "platform/ErrorLog.h"
 #include "platform/Registry.h"
 
@@ -68,20 +69,20 @@ TDM2::TDM2(QObject* parent)
     , GetKontakt(IBDatabase1, &KontaktTS, QStringLiteral("GetKontakt"), {}, this)
     , GetBlob(IBDatabase1, &BlobTS, QStringLiteral("GetBlob"), {}, this)
     , GetFromNr(IBDatabase1, &GetFromTS, QStringLiteral("GetFromNr"),
-                QStringLiteral("SELECT FROMPHONE FROM LOG WHERE LID = :ID"), this)
+                QString::fromLatin1(dmsql::kSelectFromPhone), this)
     , LogAllgemeinQuery(IBDatabase1, &LogAllgemeinTS, QStringLiteral("LogAllgemeinQuery"), {}, this)
     , LogDetailQuery(IBDatabase1, &LogDetailTS, QStringLiteral("LogDetailQuery"), {}, this)
     , ibcds_list(IBDatabase1, &ibta2, QStringLiteral("ibcds_list"),
-                 QStringLiteral("select * from V_SELECT_LIST ORDER BY CONTBEZ ASC"), this)
+                 QString::fromLatin1(dmsql::kSelectContactList), this)
     , ibcds_card(IBDatabase1, &ibta3, QStringLiteral("ibcds_card"),
-                 QStringLiteral("SELECT * FROM V_SELECT_CARD ORDER BY CONTBEZ ASC"), this)
-    , kat_list(IBDatabase1, &katlist_ts, QStringLiteral("kat_list"), QStringLiteral("SELECT * FROM KAT ORDER BY KATBEZ ASC"),
+                 QString::fromLatin1(dmsql::kSelectContactCards), this)
+    , kat_list(IBDatabase1, &katlist_ts, QStringLiteral("kat_list"), QString::fromLatin1(dmsql::kSelectCategories),
                this)
     , katdetail(IBDatabase1, &katdetail_ts, QStringLiteral("katdetail"),
-                QStringLiteral("SELECT * FROM V_SELECT_CONKAT WHERE KID = :ID ORDER BY CONTBEZ ASC"), this)
-    , ibcds_log(IBDatabase1, &logts, QStringLiteral("ibcds_log"), QStringLiteral("SELECT * FROM LOG"), this)
+                QString::fromLatin1(dmsql::kSelectCategoryContacts), this)
+    , ibcds_log(IBDatabase1, &logts, QStringLiteral("ibcds_log"), QString::fromLatin1(dmsql::kSelectLog), this)
     , ibcds_numbers(IBDatabase1, &numbers_ts, QStringLiteral("ibcds_numbers"),
-                    QStringLiteral("SELECT * FROM COM\r\nWHERE CID = :param1"), this)
+                    QString::fromLatin1(dmsql::kSelectContactNumbers), this)
 {
     setObjectName(QStringLiteral("DM2"));
     g_dm2 = this;

@@ -1,6 +1,8 @@
+#include "calllog/LogStatements.h"
 #include "db/CredentialCipher.h"
 #include "db/DatabaseError.h"
 #include "db/TDM2.h"
+#include "db/TDM2Statements.h"
 #include "platform/ErrorLog.h"
 #include "platform/Registry.h"
 #include "tests/support/ScriptedDialogService.h"
@@ -90,8 +92,8 @@ void TstDm2::connectsFromRegistry()
         QVERIFY(dm.IBTransaction1.params().isEmpty());
         QCOMPARE(dm.LogDetailTS.endAction(), FbTransaction::EndAction::None);
         QCOMPARE(dm.dataSet(QStringLiteral("IBCDS_LOG")), &dm.ibcds_log);
-        QCOMPARE(dm.ibcds_numbers.commandText(), QStringLiteral("SELECT * FROM COM\r\nWHERE CID = :param1"));
-        QCOMPARE(dm.GetFromNr.commandText(), QStringLiteral("SELECT FROMPHONE FROM LOG WHERE LID = :ID"));
+        QCOMPARE(dm.ibcds_numbers.commandText(), QString::fromLatin1(dmsql::kSelectContactNumbers));
+        QCOMPARE(dm.GetFromNr.commandText(), QString::fromLatin1(dmsql::kSelectFromPhone));
 
         // Every list opens against the schema and closes with its transaction ended.
         for (DataSet* ds : {&dm.ibcds_list, &dm.ibcds_card, &dm.kat_list, &dm.katdetail, &dm.ibcds_log, &dm.ibcds_numbers}) {
@@ -200,7 +202,7 @@ void TstDm2::logListSnapshotAndCommit()
     TDM2 dm;
     db.exec(QStringLiteral("INSERT INTO LOG (LID, FROMPHONE, FROMBEZ, TSDATE, TSTIME, CID, CTYPE, CTIME, CCHARGE, ABID)"
                            " VALUES (1, '0301234', 'Jörg', '2024-05-01', '10:00:00', 0, 1, '00:01:30', 0.12, 0);"));
-    dm.ibcds_log.setCommandText(QStringLiteral("SELECT * FROM LOG WHERE TSDATE = :TSD"));
+    dm.ibcds_log.setCommandText(QString::fromLatin1(logsql::kSelectLogOfDay));
     dm.ibcds_log.setParam(QStringLiteral("TSD"), QDate(2024, 5, 1));
     dm.ibcds_log.open();
     QCOMPARE(dm.ibcds_log.rowCount(), 1);

@@ -1,10 +1,12 @@
 // The stored procedures of the call database, called the way the program calls them, with their
 // outputs and their effects on the tables checked on a real embedded database.
 
+#include "calllog/LogStatements.h"
 #include "db/DatabaseError.h"
 #include "db/FbAttachment.h"
 #include "db/FbStatement.h"
 #include "db/FbTransaction.h"
+#include "db/TDM2Statements.h"
 #include "tests/support/TempDatabase.h"
 #include "tests/support/TestRegistry.h"
 
@@ -130,13 +132,13 @@ struct Match {
 
 Match selectLogContact(FbAttachment& db, const QString& number)
 {
-    const QVariantList out = call(db, "EXECUTE PROCEDURE P_SELECT_LOG_CONTACT (:PHONENR)", {{"PHONENR", number}});
+    const QVariantList out = call(db, logsql::kSelectLogContact, {{"PHONENR", number}});
     return {out.value(1).toString(), out.value(2).toString(), out.value(3).toInt()};
 }
 
 int countOfNumber(FbAttachment& db, const QString& number)
 {
-    return call(db, "EXECUTE PROCEDURE P_GET_COUNT_OF_NUMBER (:PN)", {{"PN", number}}).value(0).toInt();
+    return call(db, logsql::kCountOfNumber, {{"PN", number}}).value(0).toInt();
 }
 
 int count(TempDatabase& db, const QString& sql) { return db.scalar(sql).toInt(); }
@@ -519,7 +521,9 @@ void TstProcedures::countOfNumberCountsBothColumns()
     QCOMPARE(countOfNumber(a, "0401234"), 0);
 
     // The program's relinking statement finds the same rows.
-    db.exec("UPDATE LOG SET FROMBEZ = 'X', CID = 7 WHERE (FROMPHONE = '030123') or (FROMSUBB = '030123')");
+    call(a, logsql::kRelinkLog,
+         {{"FB", QString("X")}, {"FA", QString("Zentrale")}, {"C", 7}, {"FP", QString("030123")},
+          {"FS", QString("030123")}});
     QCOMPARE(count(db, "SELECT COUNT(*) FROM LOG WHERE CID = 7"), 3);
 }
 
@@ -563,7 +567,7 @@ void TstProcedures::categoryDeleteAndMove()
     auto contactsOf = [&](int kid) {
         FbTransaction tx(a);
         tx.start();
-        FbStatement st(a, &tx, "SELECT * FROM V_SELECT_CONKAT WHERE KID = :ID ORDER BY CONTBEZ ASC");
+        FbStatement st(a, &tx, dmsql::kSelectCategoryContacts);
         st.setParam(u"ID", kid);
         st.execute();
         QStringList names;

@@ -2,11 +2,13 @@
 // of the tables and views, the parameter lists of the procedures, every statement the program
 // sends, and the rows the call monitor writes.
 
+#include "calllog/LogStatements.h"
 #include "db/DatabaseError.h"
 #include "db/FbAttachment.h"
 #include "db/FbStatement.h"
 #include "db/FbTransaction.h"
 #include "db/Schema.h"
+#include "db/TDM2Statements.h"
 #include "tests/support/TempDatabase.h"
 #include "tests/support/TestRegistry.h"
 
@@ -204,28 +206,30 @@ void TstSchema::everyStatementOfTheProgramPrepares()
     TempDatabase db;
     FbAttachment& a = db.attachment();
     QStringList statements{
-        "SELECT DISTINCT TSDATE FROM LOG",
-        "DELETE FROM LOG WHERE LID = :ID",
-        "DELETE FROM LOG WHERE TSDATE = :DT",
-        "UPDATE LOG SET FROMBEZ = :FB,FROMANSCHLUSS = :FA,CID = :C WHERE (FROMPHONE = :FP)or(FROMSUBB = :FS)",
-        "SELECT FROMPHONE FROM LOG WHERE LID = :ID",
-        "SELECT * FROM LOG",
-        "SELECT * FROM LOG WHERE TSDATE = :TSD",
-        "SELECT * FROM LOG WHERE LID = :ID",
-        "UPDATE LOG SET BEMERK = :BEM WHERE LID = :ID",
+        logsql::kSelectLogDays,
+        logsql::kDeleteLogRecord,
+        logsql::kDeleteLogDay,
+        logsql::kRelinkLog,
+        logsql::kSelectLogOfDay,
+        logsql::kSelectLogRecord,
+        logsql::kUpdateRemark,
+        logsql::kSelectLogContact,
+        logsql::kCountOfNumber,
+        dmsql::kSelectFromPhone,
+        dmsql::kSelectContactList,
+        dmsql::kSelectContactCards,
+        dmsql::kSelectCategories,
+        dmsql::kSelectCategoryContacts,
+        dmsql::kSelectLog,
+        dmsql::kSelectContactNumbers,
         "select C.CONTBEZ,K.KATBEZ,A.STR,A.PLZ,A.ORT from CONTACT C left outer join CONKAT V on C.LID = V.CID left "
         "outer join KAT K ON V.KID = K.LID left outer join ADDR A ON C.LID = A.CID",
-        "select * from V_SELECT_LIST ORDER BY CONTBEZ ASC",
-        "SELECT * FROM V_SELECT_CARD ORDER BY CONTBEZ ASC",
         "SELECT * FROM V_SELECT_LIST ORDER BY CONTBEZ",
         "SELECT * FROM V_SELECT_CARD ORDER BY CONTBEZ",
         "SELECT * FROM V_SELECT_DETAIL\r\nWHERE LID = :id",
         "SELECT * FROM COM\r\nWHERE CID = :id",
         "SELECT * FROM E_MAIL\r\nWHERE CID = :id",
-        "SELECT * FROM COM\r\nWHERE CID = :param1",
         "SELECT * FROM V_SELECT_NOTIZ\r\nWHERE LID = :ID",
-        "SELECT * FROM KAT ORDER BY KATBEZ ASC",
-        "SELECT * FROM V_SELECT_CONKAT WHERE KID = :ID ORDER BY CONTBEZ ASC",
         "DELETE FROM CONKAT WHERE LID = :ID",
         "EXECUTE PROCEDURE P_CONT_INSERT (:ANR,:VNA,:NA,:FA,:TIT,:CONTB,:WEB,:ABT,:KATB,:ST,:PL,:OT,:ZUSA,:L,:BUND,:TEXT)",
         "EXECUTE PROCEDURE P_CONT_EDIT (:E_LID,:ANR,:VNA,:NA,:FA,:TIT,:CONTB,:WEB,:ABT,:KATB,:ST,:PL,:OT,:ZUSA,:L,:BUND,"
@@ -233,8 +237,6 @@ void TstSchema::everyStatementOfTheProgramPrepares()
         "EXECUTE PROCEDURE P_CONT_DELETE (:D_LID)",
         "EXECUTE PROCEDURE P_COM_SYNCHRONIZE (:L,:C,:KB,:LC,:V,:N,:VN,:LCVN,:BEM,:AURE,:NOF,:STAT)",
         "EXECUTE PROCEDURE P_MAIL_SYNCHRONIZE (:LID,:CID,:MAILADDR,:BEMERK,:STATUS)",
-        "EXECUTE PROCEDURE P_SELECT_LOG_CONTACT (:PHONENR)",
-        "EXECUTE PROCEDURE P_GET_COUNT_OF_NUMBER (:PN)",
         "EXECUTE PROCEDURE P_KAT_INSERT (:KID,:KA,:BEM)",
         "EXECUTE PROCEDURE P_KAT_DELETE (:KID)",
         "EXECUTE PROCEDURE P_CHANGE_CONKAT (:CK_ID,:KID)",
