@@ -49,7 +49,7 @@ void DelDayLogExecute(TLogform& w)
                     + QStringLiteral(" löschen?")))
         return;
     const bool deleted = w.maintenance().DeleteLogDay(day, &w);
-    const bool marked = w.maintenance().markLogDays(1, w.markContext());
+    const bool marked = w.maintenance().markLogDays(DayMarking::MarksAndShowDay, w.markContext());
     if (deleted && marked)
         informationBox(QStringLiteral("Tagesprotokoll wurde erfolgreich gelöscht."));
 }

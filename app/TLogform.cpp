@@ -294,7 +294,7 @@ void TLogform::FormCreate(const QStringList& parameters)
         reportError(QStringLiteral("# GetActivePanel"), &e);
     }
 
-    if (!m_maintenance->markLogDays(0, markContext()))
+    if (!m_maintenance->markLogDays(DayMarking::MarksOnly, markContext()))
         m_navBar->setEnabled(false);
 
     m_busy = false;

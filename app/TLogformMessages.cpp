@@ -101,7 +101,7 @@ void TLogform::WMLOGINFOCHANGE_(qintptr wParam, qintptr lParam)
     BusyScope busy(m_busy);
     try {
         if (lParam != 1)
-            m_maintenance->markLogDays(1, markContext());
+            m_maintenance->markLogDays(DayMarking::MarksAndShowDay, markContext());
         if (m_logFrame)
             m_logFrame->Refresh_View(fitsInt(wParam) ? static_cast<int>(wParam) : 0);
     } catch (const std::exception& e) {
@@ -272,7 +272,7 @@ int TLogform::CreateConDataEdit(int contactKey, int logKey)
                                        "korrekt aus der Datenbank ermittelt werden."));
             return -1;
         }
-        if (m_maintenance->CheckOfNumber(callerNumber) != 0)
+        if (m_maintenance->CheckOfNumber(callerNumber) != NumberCheck::NotStored)
             return -1;
     }
     if (!m_factories.contactEditWindow)

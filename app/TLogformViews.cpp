@@ -155,8 +155,9 @@ void TLogform::syncLogButtons()
     if (!m_logFrame)
         return;
     int filterKind = 0;
-    int groupKind = 0;
-    m_logFrame->WhatsOn(filterKind, groupKind);
+    LogGrouping grouping = LogGrouping::None;
+    m_logFrame->WhatsOn(filterKind, grouping);
+    const int groupKind = static_cast<int>(grouping);
     FlagGuard guard(m_grouping);
     if (filterKind >= 0 && filterKind <= 3)
         m_rzrb[3 + filterKind]->setChecked(true);
@@ -210,7 +211,7 @@ void TLogform::logGroupClicked(QCheckBox* box)
         for (int n = 5; n <= 10; ++n)
             m_rzcb[n]->setChecked(m_rzcb[n] == box);
         if (m_logFrame) {
-            m_logFrame->ToGroup(box->property("tag").toInt() - 5);
+            m_logFrame->ToGroup(static_cast<LogGrouping>(box->property("tag").toInt() - 5));
             m_logFrame->SetTableViewPopup();
         }
     } catch (const std::exception& e) {

@@ -170,14 +170,14 @@ int main(int argc, char* argv[])
             paint(frame);
             const qint64 sort = t.nsecsElapsed();
 
-            frame.ToGroup(0);
+            frame.ToGroup(LogGrouping::None);
             g->reapply();
             t.restart();
-            frame.ToGroup(2);
+            frame.ToGroup(LogGrouping::Caller);
             paint(frame);
             const qint64 group = t.nsecsElapsed();
 
-            frame.ToGroup(0);
+            frame.ToGroup(LogGrouping::None);
             g->reapply();
             t.restart();
             frame.SetNewFilter(2);

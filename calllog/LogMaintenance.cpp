@@ -94,14 +94,14 @@ bool LogMaintenance::gettinglogdates(PlannerCalendar& calendar)
     return ok;
 }
 
-bool LogMaintenance::markLogDays(int mode, const LogMarkContext& context)
+bool LogMaintenance::markLogDays(DayMarking mode, const LogMarkContext& context)
 {
     if (!context.calendar)
         return false;
     FrozenCalendar frozen(context.calendar);
     PlannerCalendar& calendar = *context.calendar;
     const bool ok = gettinglogdates(calendar);
-    if (mode != 1 || !ok || !context.frame || !context.calendarViewShown)
+    if (mode != DayMarking::MarksAndShowDay || !ok || !context.frame || !context.calendarViewShown)
         return ok;
     LogListFrame& frame = *context.frame;
     if (calendar.hasEvents()) {
@@ -190,12 +190,12 @@ bool LogMaintenance::GetFromphoneByLog(int lid, QString& number)
     return false;
 }
 
-int LogMaintenance::CheckOfNumber(const QString& number)
+NumberCheck LogMaintenance::CheckOfNumber(const QString& number)
 {
     const QString failure = QStringLiteral("# Orvanta - CheckOfNumber\r\nRufnummer konnte nicht überprüft werden!\r\n"
                                            "Die Bearbeitung wird abgebrochen.");
     if (!connected(m_dm))
-        return 2;
+        return NumberCheck::Failed;
     FbStatement& sql = m_dm->NumCheck_SQL;
     QString label;
     QString name;
@@ -211,9 +211,9 @@ int LogMaintenance::CheckOfNumber(const QString& number)
     });
     sql.close();
     if (!ok)
-        return 2;
+        return NumberCheck::Failed;
     if (key <= 0)
-        return 0;
+        return NumberCheck::NotStored;
     BusyCursor::resetCursor();
     const QString question = QStringLiteral("Die Rufnummer ist bereits als\r\n\"") + label + QStringLiteral("\"\r\n")
         + QStringLiteral("bei dem Kontakt") + QStringLiteral("\r\n\"") + name + QStringLiteral("\"\r\n")
@@ -221,10 +221,10 @@ int LogMaintenance::CheckOfNumber(const QString& number)
         + QStringLiteral("Möchten Sie die Logbucheinträge mit dem Kontakt verknüpfen?");
     if (dialogs().question(question) == DialogButton::Yes) {
         if (!LogbuchAnpassen(number, label, key, name))
-            return 2;
+            return NumberCheck::Failed;
         dialogs().information(QStringLiteral("Logbucheinträge wurden angepasst."));
     }
-    return 1;
+    return NumberCheck::Stored;
 }
 
 bool LogMaintenance::LogCheckOfNumber(const QString& number)

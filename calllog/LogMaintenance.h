@@ -25,6 +25,16 @@ struct LogMarkContext {
     bool calendarViewShown = false;
 };
 
+// What the day marking does besides marking: nothing, or bring the log list to a day with calls.
+enum class DayMarking { MarksOnly, MarksAndShowDay };
+
+// The outcome of checking a caller's number before a contact is made from it.
+enum class NumberCheck {
+    NotStored,    // no contact has the number: go on making one
+    Stored,       // a contact has it; the user was asked whether to link the calls
+    Failed,       // the check or the relinking failed (reported)
+};
+
 class LogMaintenance final {
 public:
     // dm may be null: every operation then reports the missing connection.
@@ -34,16 +44,15 @@ public:
 
     // Fills the calendar's day marks ("Protokoll vom dd.mm.yyyy").
     bool gettinglogdates(PlannerCalendar& calendar);
-    // mode 0: marks only; mode 1: marks, then moves calendar and log list to a day with entries.
-    bool markLogDays(int mode, const LogMarkContext& context);
+    // MarksAndShowDay: then moves calendar and log list to a day with entries.
+    bool markLogDays(DayMarking mode, const LogMarkContext& context);
 
     // mainWindow receives WMUPDATEVOICEBOXGRID after a deletion.
     bool DeleteLogItem(int lid, QObject* mainWindow);
     bool DeleteLogDay(QDate day, QObject* mainWindow);
 
     bool GetFromphoneByLog(int lid, QString& number);
-    // 0 = number not stored at any contact, 1 = stored (the user was asked), 2 = relinking failed.
-    int CheckOfNumber(const QString& number);
+    NumberCheck CheckOfNumber(const QString& number);
     bool LogCheckOfNumber(const QString& number);
     bool LogbuchAnpassen(const QString& number, const QString& numberLabel, int contactKey, const QString& contactName);
 

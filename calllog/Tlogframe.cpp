@@ -554,7 +554,7 @@ void Tlogframe::ColuGroup(const QString& caption)
     }
 }
 
-void Tlogframe::ToGroup(int kind)
+void Tlogframe::ToGroup(LogGrouping kind)
 {
     try {
         BusyCursor busy;
@@ -562,21 +562,22 @@ void Tlogframe::ToGroup(int kind)
             ViewLock lock(m_view);
             NoGroup();
             switch (kind) {
-            case 1:
+            case LogGrouping::Date:
                 ColuGroup(QStringLiteral("Datum"));
                 break;
-            case 2:
+            case LogGrouping::Caller:
                 ColuGroup(QStringLiteral("Anrufer"));
                 break;
-            case 3:
+            case LogGrouping::Callee:
                 ColuGroup(QStringLiteral("An"));
                 break;
-            case 4:
+            case LogGrouping::Free:
                 controller()->setGroupByBoxVisible(true);
                 break;
-            case 5:
+            case LogGrouping::Direction:
                 ColuGroup(QStringLiteral("Verbindung"));
                 break;
+            case LogGrouping::None:
             default:
                 break;
             }
@@ -666,13 +667,13 @@ void Tlogframe::SetNewFilter(int kind)
     UpdateLogCaption();
 }
 
-void Tlogframe::WhatsOn(int& filterKind, int& groupKind)
+void Tlogframe::WhatsOn(int& filterKind, LogGrouping& grouping)
 {
     try {
         m_filterName.clear();
         UpdateLogCaption();
         filterKind = 0;
-        groupKind = 0;
+        grouping = LogGrouping::None;
         const GridController* g = controller();
         if (g->filter().active && !g->filter().isEmpty()) {
             const QString text = g->filterText();
@@ -688,7 +689,7 @@ void Tlogframe::WhatsOn(int& filterKind, int& groupKind)
             UpdateLogCaption();
         }
         if (g->isGroupByBoxVisible()) {
-            groupKind = 4;
+            grouping = LogGrouping::Free;
             return;
         }
         for (const int c : g->columnOrder()) {
@@ -696,13 +697,13 @@ void Tlogframe::WhatsOn(int& filterKind, int& groupKind)
                 continue;
             const QString& caption = g->column(c).caption;
             if (caption == QLatin1String("Datum"))
-                groupKind = 1;
+                grouping = LogGrouping::Date;
             else if (caption == QLatin1String("Anrufer"))
-                groupKind = 2;
+                grouping = LogGrouping::Caller;
             else if (caption == QLatin1String("An"))
-                groupKind = 3;
+                grouping = LogGrouping::Callee;
             else if (caption == QLatin1String("Verbindung"))
-                groupKind = 5;
+                grouping = LogGrouping::Direction;
             break;
         }
     } catch (const std::exception& e) {

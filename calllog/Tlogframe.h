@@ -56,8 +56,8 @@ public:
     bool Firstep(QObject* host) override;
     bool OpenDBonDay(QDate day) override;
     void SetNewFilter(int kind) override;
-    void ToGroup(int kind) override;
-    void WhatsOn(int& filterKind, int& groupKind) override;
+    void ToGroup(LogGrouping kind) override;
+    void WhatsOn(int& filterKind, LogGrouping& grouping) override;
     void SetTableViewPopup() override;
     void Refresh_View(int lid) override;
     bool StoreLogView() override;

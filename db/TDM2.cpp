@@ -10,8 +10,6 @@ namespace orvanta {
 
 namespace {
 
-TDM2* g_dm2 = nullptr;
-
 const QStringList kConcurrencyNowait = {QStringLiteral("concurrency"), QStringLiteral("nowait")};
 
 using End = FbTransaction::EndAction;
@@ -24,11 +22,6 @@ void putFirst(QStringList& params, const QString& key, const QString& value)
 }
 
 } // namespace
-
-TDM2* DM2()
-{
-    return g_dm2;
-}
 
 void TDM2::restart(FbTransaction& transaction)
 {
@@ -85,7 +78,6 @@ TDM2::TDM2(QObject* parent)
                     QString::fromLatin1(dmsql::kSelectContactNumbers), this)
 {
     setObjectName(QStringLiteral("DM2"));
-    g_dm2 = this;
 
     const auto restartHook = [](DataSet& ds) { restart(*ds.transaction()); };
     const auto commitHook = [](DataSet& ds) { commitIfActive(*ds.transaction()); };
@@ -122,8 +114,6 @@ TDM2::~TDM2()
     } catch (const std::exception&) {
         // Shutting down: a failed detach leaves nothing to save.
     }
-    if (g_dm2 == this)
-        g_dm2 = nullptr;
 }
 
 bool TDM2::GetDBData(FbAttachment& connection)

@@ -1,7 +1,8 @@
 #pragma once
 // The data module: the one connection of the program, every shared transaction, statement, query
 // and read-only data set, and the fields that carry the focused records between windows. Created
-// first at start-up and destroyed last; every other part reaches it through DM2().
+// first at start-up and destroyed last. Start-up hands it to the main window, which hands it to
+// every frame and window it makes; there is no global one to reach for.
 
 #include "db/DataSet.h"
 #include "db/FbAttachment.h"
@@ -18,9 +19,9 @@ class TDM2 final : public QObject {
 
 public:
     // Reads the connection data and connects; a failure leaves the module unconnected (reported
-    // through the error log when it exists). Installs itself as DM2().
+    // through the error log when it exists).
     explicit TDM2(QObject* parent = nullptr);
-    // Closes the data sets, disconnects, and uninstalls itself.
+    // Closes the data sets and disconnects.
     ~TDM2() override;
 
     // Reads database name and credentials from HKEY_LOCAL_MACHINE "software\Varnik\rufwarte"
@@ -94,8 +95,5 @@ public:
 private:
     void closeDataSets() noexcept;
 };
-
-// The shared data module; nullptr before creation and after destruction.
-[[nodiscard]] TDM2* DM2();
 
 } // namespace orvanta

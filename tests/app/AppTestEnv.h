@@ -76,15 +76,22 @@ private:
     std::unique_ptr<TLogform> m_window;
 };
 
-// A log list that records what the host asks of it; Refresh_View can take its time.
+// A log list that keeps the state the host leaves it in; Refresh_View can take its time.
 class RecordingLogFrame final : public LogListFrame {
 public:
     using LogListFrame::LogListFrame;
 
-    QStringList calls;
     int refreshMs = 0;
+    int filterKind = 0;
+    LogGrouping groupKind = LogGrouping::None;
+    int groupings = 0;        // how often the grouping was rebuilt
+    int columnMenuBuilds = 0; // how often the "Ansicht" menu was rebuilt
+    int refreshedLid = -1;
+    int refreshes = 0;        // completed refreshes
+    bool noLog = false;
+    bool stored = false;
     int whatsOnFilter = 0;
-    int whatsOnGroup = 0;
+    LogGrouping whatsOnGroup = LogGrouping::None;
     int currentLid = -1;
     bool busy = false;
     std::function<void()> onToGroup;
@@ -93,45 +100,41 @@ public:
     int viewMode() const override { return m_mode; }
     void setLogDay(QDate day) override { m_day = day; }
     QDate logDay() const override { return m_day; }
-    void setNoLog(bool noLog) override { calls << QStringLiteral("setNoLog %1").arg(noLog); }
+    void setNoLog(bool value) override { noLog = value; }
     void setCaptionText(const QString& text) override { m_caption = text; }
     QString captionText() const override { return m_caption; }
     bool isBusy() const override { return busy; }
     void setBusy(bool b) override { busy = b; }
-    bool Firstep(QObject*) override
-    {
-        calls << QStringLiteral("Firstep");
-        return true;
-    }
+    bool Firstep(QObject*) override { return true; }
     bool OpenDBonDay(QDate day) override
     {
         m_day = day;
-        calls << QStringLiteral("OpenDBonDay ") + day.toString(Qt::ISODate);
         return true;
     }
-    void SetNewFilter(int kind) override { calls << QStringLiteral("SetNewFilter %1").arg(kind); }
-    void ToGroup(int kind) override
+    void SetNewFilter(int kind) override { filterKind = kind; }
+    void ToGroup(LogGrouping kind) override
     {
-        calls << QStringLiteral("ToGroup %1").arg(kind);
+        groupKind = kind;
+        ++groupings;
         if (onToGroup)
             onToGroup();
     }
-    void WhatsOn(int& f, int& g) override
+    void WhatsOn(int& f, LogGrouping& g) override
     {
         f = whatsOnFilter;
         g = whatsOnGroup;
     }
-    void SetTableViewPopup() override { calls << QStringLiteral("SetTableViewPopup"); }
+    void SetTableViewPopup() override { ++columnMenuBuilds; }
     void Refresh_View(int lid) override
     {
-        calls << QStringLiteral("Refresh_View %1").arg(lid);
         if (refreshMs > 0)
             QTest::qWait(refreshMs);
-        calls << QStringLiteral("Refresh_View done");
+        refreshedLid = lid;
+        ++refreshes;
     }
     bool StoreLogView() override
     {
-        calls << QStringLiteral("StoreLogView");
+        stored = true;
         return true;
     }
     bool CanExpandGroups() const override { return false; }

@@ -184,10 +184,10 @@ void TstLogFrame::damagedLayoutFilesFallBackToDefault()
     QVERIFY(f.controller()->isColumnVisible(column(f, "FROMBEZ")));
     QVERIFY(!f.controller()->isGrouped());
     int filterKind = -1;
-    int groupKind = -1;
+    LogGrouping groupKind = LogGrouping(-1);
     f.WhatsOn(filterKind, groupKind);
     QCOMPARE(filterKind, 0);
-    QCOMPARE(groupKind, 0);
+    QCOMPARE(groupKind, LogGrouping::None);
     QCOMPARE(env.dialogs().count(), 0);
 }
 
@@ -221,10 +221,10 @@ void TstLogFrame::periodFilterAppliedOnceAndCleared()
     Tlogframe next(&env.dm());
     next.Firstep(&env.host());
     int filterKind = -1;
-    int groupKind = -1;
+    LogGrouping groupKind = LogGrouping(-1);
     next.WhatsOn(filterKind, groupKind);
     QCOMPARE(filterKind, 3);
-    QCOMPARE(groupKind, 0);
+    QCOMPARE(groupKind, LogGrouping::None);
     QCOMPARE(next.filterName(), QStringLiteral("is this month"));
     QCOMPARE(next.captionText(), QStringLiteral("Anrufprotokoll (gefiltert nach \"dieser Monat\")"));
 
@@ -327,7 +327,7 @@ void TstLogFrame::oddValuesInTypedColumns()
     QCOMPARE(env.dm().CurLogABID, 7);
 
     // Grouping and sorting over those columns stay whole.
-    f.ToGroup(5);
+    f.ToGroup(LogGrouping::Direction);
     QCOMPARE(g->recordCount(), 3);
     g->headerClicked(column(f, "SERVICE"), Qt::NoModifier);
     QCOMPARE(g->recordCount(), 3);
@@ -346,14 +346,14 @@ void TstLogFrame::groupingByCallerAndBack()
     GridController* g = f.controller();
     const int anrufer = column(f, "FROMBEZ");
 
-    f.ToGroup(2);
+    f.ToGroup(LogGrouping::Caller);
     QCOMPARE(g->groupedColumns(), std::vector<int>{anrufer});
     QVERIFY(!g->isColumnVisible(anrufer));
     QVERIFY(f.CanExpandGroups());
     int filterKind = -1;
-    int groupKind = -1;
+    LogGrouping groupKind = LogGrouping(-1);
     f.WhatsOn(filterKind, groupKind);
-    QCOMPARE(groupKind, 2);
+    QCOMPARE(groupKind, LogGrouping::Caller);
     // All groups collapsed but the one holding the data set's last record, which is focused.
     QCOMPARE(env.dm().CurLogLID, 6);
     QVERIFY(!g->isGroupRow(g->focusedRow()));
@@ -365,25 +365,25 @@ void TstLogFrame::groupingByCallerAndBack()
     QCOMPARE(g->rowCount(), 5);
     QCOMPARE(g->groupRowText(2), QStringLiteral("Anrufer: Meier (2)"));
 
-    f.ToGroup(0);
+    f.ToGroup(LogGrouping::None);
     QVERIFY(!g->isGrouped());
     QVERIFY(g->isColumnVisible(anrufer));
     QCOMPARE(g->sortedColumns(), (std::vector<int>{column(f, "TSDATE"), column(f, "TSTIME")}));
     QCOMPARE(lids(f), (QList<int>{5, 4, 3, 2, 1, 6}));
     QVERIFY(!f.CanExpandGroups());
 
-    f.ToGroup(1);
+    f.ToGroup(LogGrouping::Date);
     f.ExpandAllGroups(true);
     QCOMPARE(g->groupRowText(0), QStringLiteral("Datum: 15.05.2024 (2)"));
-    f.ToGroup(4);
+    f.ToGroup(LogGrouping::Free);
     QVERIFY(g->isGroupByBoxVisible());
     f.WhatsOn(filterKind, groupKind);
-    QCOMPARE(groupKind, 4);
-    f.ToGroup(5);
+    QCOMPARE(groupKind, LogGrouping::Free);
+    f.ToGroup(LogGrouping::Direction);
     QVERIFY(!g->isGroupByBoxVisible());
     f.WhatsOn(filterKind, groupKind);
-    QCOMPARE(groupKind, 5);
-    f.ToGroup(9);
+    QCOMPARE(groupKind, LogGrouping::Direction);
+    f.ToGroup(LogGrouping(9)); // not a kind: nothing
     QVERIFY(!g->isGrouped());
 }
 
@@ -405,7 +405,7 @@ void TstLogFrame::focusedRowDrivesActionsAndMessages()
     QCOMPARE(env.host().of(WMLOGOPENBEMERKUNG).size(), 1);
 
     // A group row: nothing is focused for the other windows, both actions go off.
-    f.ToGroup(2);
+    f.ToGroup(LogGrouping::Caller);
     g->setFocusedRow(0);
     QVERIFY(g->isGroupRow(0));
     QCOMPARE(env.dm().CurLogLID, -1);
@@ -533,7 +533,7 @@ void TstLogFrame::databaseGoneKeepsTheFrameUsable()
     f.lf_bemerkungUpdate();
     QVERIFY(!action(f, "lf_bemerkung")->isEnabled());
     f.SetNewFilter(2);
-    f.ToGroup(2);
+    f.ToGroup(LogGrouping::Caller);
     QVERIFY(f.StoreLogView());
     QCOMPARE(env.dialogs().count(), 0);
 

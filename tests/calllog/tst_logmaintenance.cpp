@@ -71,17 +71,17 @@ private Q_SLOTS:
         frame.Firstep(&env.host());
 
         // The calendar view is not shown: marks only.
-        QVERIFY(m.markLogDays(1, {&calendar, &frame, false}));
+        QVERIFY(m.markLogDays(DayMarking::MarksAndShowDay, {&calendar, &frame, false}));
         QCOMPARE(frame.logDay(), LogTestEnv::today());
 
-        QVERIFY(m.markLogDays(1, {&calendar, &frame, true}));
+        QVERIFY(m.markLogDays(DayMarking::MarksAndShowDay, {&calendar, &frame, true}));
         QCOMPARE(frame.logDay(), QDate(2024, 5, 14));
         QCOMPARE(calendar.date(), QDate(2024, 5, 14));
         QCOMPARE(frame.captionText(), QStringLiteral("Anrufprotokoll vom 14.05.2024"));
 
         // A day that has entries stays.
         frame.OpenDBonDay(QDate(2024, 5, 1));
-        QVERIFY(m.markLogDays(1, {&calendar, &frame, true}));
+        QVERIFY(m.markLogDays(DayMarking::MarksAndShowDay, {&calendar, &frame, true}));
         QCOMPARE(frame.logDay(), QDate(2024, 5, 1));
         QCOMPARE(calendar.date(), QDate(2024, 5, 1));
     }
@@ -95,7 +95,7 @@ private Q_SLOTS:
         frame.setViewMode(1);
         frame.setLogDay(QDate(2024, 1, 1));
         frame.Firstep(&env.host());
-        QVERIFY(m.markLogDays(1, {&calendar, &frame, true}));
+        QVERIFY(m.markLogDays(DayMarking::MarksAndShowDay, {&calendar, &frame, true}));
         QVERIFY(!calendar.hasEvents());
         QCOMPARE(frame.logDay(), LogTestEnv::today());
         QVERIFY(frame.isBusy());
@@ -166,19 +166,19 @@ private Q_SLOTS:
         addContact(env);
         LogMaintenance m(&env.dm());
 
-        QCOMPARE(m.CheckOfNumber(QStringLiteral("0777777")), 0);
+        QCOMPARE(m.CheckOfNumber(QStringLiteral("0777777")), NumberCheck::NotStored);
         QCOMPARE(env.dialogs().count(), 0);
 
         // No: nothing changes, but the number counts as stored.
         env.dialogs().enqueueAnswer(DialogButton::No);
-        QCOMPARE(m.CheckOfNumber(QStringLiteral("0301111")), 1);
+        QCOMPARE(m.CheckOfNumber(QStringLiteral("0301111")), NumberCheck::Stored);
         QCOMPARE(env.dialogs().last().text,
                  QStringLiteral("Die Rufnummer ist bereits als\r\n\"Zentrale\"\r\nbei dem Kontakt\r\n\"Müller GmbH\"\r\n"
                                 "hinterlegt!\r\n\r\nMöchten Sie die Logbucheinträge mit dem Kontakt verknüpfen?"));
         QCOMPARE(count(env, QStringLiteral("CID = 7")), 0);
 
         env.dialogs().enqueueAnswer(DialogButton::Yes);
-        QCOMPARE(m.CheckOfNumber(QStringLiteral("0301111")), 1);
+        QCOMPARE(m.CheckOfNumber(QStringLiteral("0301111")), NumberCheck::Stored);
         QCOMPARE(env.dialogs().last().text, QStringLiteral("Logbucheinträge wurden angepasst."));
         QCOMPARE(env.dialogs().last().kind, DialogKind::Information);
         QCOMPARE(count(env, QStringLiteral("CID = 7")), 2);
@@ -193,7 +193,7 @@ private Q_SLOTS:
         QVERIFY(!m.DeleteLogItem(1, nullptr));
         QString number;
         QVERIFY(!m.GetFromphoneByLog(1, number));
-        QCOMPARE(m.CheckOfNumber(QStringLiteral("0301111")), 2);
+        QCOMPARE(m.CheckOfNumber(QStringLiteral("0301111")), NumberCheck::Failed);
         QCOMPARE(env.dialogs().count(), 4);
         for (const QString& text : env.dialogs().texts())
             QCOMPARE(text, QStringLiteral("# DM2 - DBConnect\r\nKeine Verbindung zur Datenbank!"));

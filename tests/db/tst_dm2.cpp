@@ -71,10 +71,8 @@ void TstDm2::connectsFromRegistry()
     Environment env;
     TempDatabase db;
     env.writeGood(db.path());
-    QVERIFY(DM2() == nullptr);
     {
         TDM2 dm;
-        QCOMPARE(DM2(), &dm);
         QVERIFY(dm.IBDatabase1.isConnected());
         QCOMPARE(dm.IBDatabase1.databaseName(), db.path());
         QCOMPARE(dm.IBDatabase1.params(), (QStringList{QStringLiteral("user_name=SYSDBA"), QStringLiteral("password=masterkey"),
@@ -104,7 +102,6 @@ void TstDm2::connectsFromRegistry()
         }
         dm.ibcds_log.open(); // left open: destruction closes it and disconnects
     }
-    QVERIFY(DM2() == nullptr);
     QCOMPARE(dialogs->count(), 0);
 }
 

@@ -8,6 +8,10 @@
 
 namespace orvanta {
 
+// How the log list groups its rows. The values are the main window's group boxes' tags minus 5
+// and what a restored layout reports back.
+enum class LogGrouping : int { None = 0, Date = 1, Caller = 2, Callee = 3, Free = 4, Direction = 5 };
+
 class LogListFrame : public QWidget {
     Q_OBJECT
     Q_DISABLE_COPY_MOVE(LogListFrame)
@@ -33,8 +37,8 @@ public:
     virtual bool Firstep(QObject* host) = 0;
     virtual bool OpenDBonDay(QDate day) = 0;
     virtual void SetNewFilter(int kind) = 0;
-    virtual void ToGroup(int kind) = 0;
-    virtual void WhatsOn(int& filterKind, int& groupKind) = 0;
+    virtual void ToGroup(LogGrouping kind) = 0;
+    virtual void WhatsOn(int& filterKind, LogGrouping& grouping) = 0;
     virtual void SetTableViewPopup() = 0;
     virtual void Refresh_View(int lid) = 0;
     virtual bool StoreLogView() = 0;
