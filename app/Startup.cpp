@@ -33,7 +33,8 @@ int Startup::run(int argc, char* argv[])
     useSharedEmbeddedEngine();
     QApplication app(argc, argv);
     QApplication::setApplicationName(QStringLiteral("Varnik Orvanta"));
-    QApplication::setApplicationDisplayName(QStringLiteral("Varnik Orvanta"));
+    // No display name: Qt would append it to every window title on Linux, and each window's
+    // title is its own caption and nothing more.
     QApplication::setApplicationVersion(QStringLiteral(ORVANTA_VERSION));
     MessageBoxDialogService messageBoxes;
     setDialogService(&messageBoxes);

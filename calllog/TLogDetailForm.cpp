@@ -14,6 +14,7 @@
 
 #include <QAction>
 #include <QCloseEvent>
+#include <QKeyEvent>
 #include <QGridLayout>
 #include <QGuiApplication>
 #include <QLabel>
@@ -375,6 +376,24 @@ void TLogDetailForm::RzB3Click()
         }
     }
     close();
+}
+
+void TLogDetailForm::keyPressEvent(QKeyEvent* event)
+{
+    switch (event->key()) {
+    case Qt::Key_Return:
+    case Qt::Key_Enter:
+        if (m_ok->isEnabled())
+            m_ok->trigger();
+        else
+            RzB3Click();
+        return;
+    case Qt::Key_Escape:
+        RzB3Click();
+        return;
+    default:
+        QWidget::keyPressEvent(event);
+    }
 }
 
 void TLogDetailForm::closeEvent(QCloseEvent* event)

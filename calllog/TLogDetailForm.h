@@ -52,6 +52,8 @@ public:
 protected:
     void showEvent(QShowEvent* event) override;
     void closeEvent(QCloseEvent* event) override;
+    // Enter acts as "OK" (closing when nothing changed), Escape as "Abbrechen".
+    void keyPressEvent(QKeyEvent* event) override;
 
 private:
     void FormShow();

@@ -76,6 +76,7 @@ private Q_SLOTS:
     void emptyDateAndUnknownDirection();
     void saveActionsFollowTheRemark();
     void cancelAsksOnlyWhenChanged();
+    void enterSavesAndEscapeCancels();
     void failedLoadLocksTheSaves();
     void recordDeletedWhileOpen();
     void databaseGoneWhileEditing();
@@ -206,6 +207,40 @@ void TstLogDetail::cancelAsksOnlyWhenChanged()
         QCOMPARE(env.dialogs().count(), 2);
         QVERIFY(!w->isVisible());
         QCOMPARE(remarkOf(env, 10).toString(), QStringLiteral("danach"));
+    }
+}
+
+void TstLogDetail::enterSavesAndEscapeCancels()
+{
+    LogTestEnv env;
+    addFullCall(env);
+    {
+        // Enter in the remark field saves and closes, like "OK".
+        auto w = openWindow(env, 10);
+        edit(*w)->setFocus();
+        edit(*w)->setText(QStringLiteral("per Enter"));
+        QTest::keyClick(edit(*w), Qt::Key_Return);
+        QVERIFY(!w->isVisible());
+        QCOMPARE(remarkOf(env, 10).toString(), QStringLiteral("per Enter"));
+        QCOMPARE(env.dialogs().count(), 0);
+    }
+    {
+        // Nothing changed: Enter just closes.
+        auto w = openWindow(env, 10);
+        QTest::keyClick(edit(*w), Qt::Key_Enter);
+        QVERIFY(!w->isVisible());
+        QCOMPARE(env.dialogs().count(), 0);
+    }
+    {
+        // Escape is "Abbrechen": it asks about the change, and "Nein" keeps the stored text.
+        auto w = openWindow(env, 10);
+        edit(*w)->setText(QStringLiteral("verworfen"));
+        env.dialogs().enqueueAnswer(DialogButton::No);
+        QTest::keyClick(edit(*w), Qt::Key_Escape);
+        QCOMPARE(env.dialogs().count(), 1);
+        QCOMPARE(env.dialogs().last().text, QStringLiteral("Änderungen speichern?"));
+        QVERIFY(!w->isVisible());
+        QCOMPARE(remarkOf(env, 10).toString(), QStringLiteral("per Enter"));
     }
 }
 

@@ -5,6 +5,7 @@
 #include "ui/grid/GridModel.h"
 #include "ui/grid/GridView.h"
 #include "ui/grid/MemoryGridSource.h"
+#include "ui/texts/UiTexts.h"
 
 #include <QAbstractItemModelTester>
 #include <QMenu>
@@ -223,6 +224,29 @@ private Q_SLOTS:
         QVERIFY(g->isGroupExpanded(0));
         QCOMPARE(dbl.count(), 1);
         QCOMPARE(g->groupRowText(0), QStringLiteral("Anrufer: Abel (20)"));
+    }
+
+    void emptyGridAndGroupBoxShowTheInstalledTexts()
+    {
+        // The texts come from the one replaceable table, so the German ones installed at
+        // start-up are what the user sees.
+        MemoryGridSource empty({{QStringLiteral("LID"), GridFieldType::Integer}});
+        GridView view;
+        view.addColumn(GridColumn(QStringLiteral("cLID"), QStringLiteral("LID"), QStringLiteral("Nr"), 0, 40));
+        view.setSource(&empty);
+        view.resize(300, 200);
+        const QString before = uiText(UiText::GridNoData);
+        setUiText(UiText::GridNoData, QString());
+        const QImage blank = view.viewport()->grab().toImage();
+        setUiText(UiText::GridNoData, QStringLiteral("<Keine Daten vorhanden>"));
+        const QImage withText = view.viewport()->grab().toImage();
+        setUiText(UiText::GridNoData, before);
+        QVERIFY(blank != withText);
+
+        const QString hint = uiText(UiText::GridGroupByBox);
+        setUiText(UiText::GridGroupByBox, QStringLiteral("Spaltenkopf hierher ziehen"));
+        QCOMPARE(GridGroupBox::hintText(), QStringLiteral("Spaltenkopf hierher ziehen"));
+        setUiText(UiText::GridGroupByBox, hint);
     }
 
     void lockDefersPaintingAndSignals()

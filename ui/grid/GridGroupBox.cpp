@@ -1,5 +1,7 @@
 #include "ui/grid/GridGroupBox.h"
 
+#include "ui/texts/UiTexts.h"
+
 #include "ui/grid/GridController.h"
 
 #include <QMouseEvent>
@@ -18,7 +20,7 @@ GridGroupBox::GridGroupBox(GridController* controller, QWidget* parent)
 
 QString GridGroupBox::hintText()
 {
-    return QStringLiteral("Ziehen Sie eine Spaltenüberschrift hierher, um nach dieser Spalte zu gruppieren");
+    return uiText(UiText::GridGroupByBox);
 }
 
 QSize GridGroupBox::sizeHint() const

@@ -28,13 +28,14 @@ void GridHeader::initStyleOptionForIndex(QStyleOptionHeader* option, int logical
     QHeaderView::initStyleOptionForIndex(option, logicalIndex);
     if (logicalIndex < 0 || logicalIndex >= m_controller->columnCount())
         return;
-    // Qt draws "down" for ascending, as its own views do.
+    // The styles draw SortUp as an arrow pointing up: up for ascending, down for descending
+    // (newest first shows a down arrow, as users of office programs expect).
     switch (m_controller->sortIndex(logicalIndex) >= 0 ? m_controller->sortOrder(logicalIndex) : GridSortOrder::None) {
     case GridSortOrder::Ascending:
-        option->sortIndicator = QStyleOptionHeader::SortDown;
+        option->sortIndicator = QStyleOptionHeader::SortUp;
         break;
     case GridSortOrder::Descending:
-        option->sortIndicator = QStyleOptionHeader::SortUp;
+        option->sortIndicator = QStyleOptionHeader::SortDown;
         break;
     case GridSortOrder::None:
         option->sortIndicator = QStyleOptionHeader::None;

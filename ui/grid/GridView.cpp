@@ -1,5 +1,7 @@
 #include "ui/grid/GridView.h"
 
+#include "ui/texts/UiTexts.h"
+
 #include "ui/grid/GridController.h"
 #include "ui/grid/GridGroupBox.h"
 #include "ui/grid/GridHeader.h"
@@ -422,6 +424,12 @@ void GridView::paintEvent(QPaintEvent* event)
     const int first = firstVisibleRow();
     const int last = std::min(rows, first + visibleRowCapacity() + 1);
     const int focused = m_controller->focusedRow();
+    if (rows == 0) {
+        // An empty grid says so instead of showing a blank area.
+        p.setPen(palette().color(QPalette::Disabled, QPalette::Text));
+        p.drawText(viewport()->rect().adjusted(4, 4, -4, -4), Qt::AlignHCenter | Qt::AlignTop, uiText(UiText::GridNoData));
+        return;
+    }
     for (int row = first; row < last; ++row) {
         const QRect rect(0, (row - first) * m_rowHeight, viewport()->width(), m_rowHeight);
         if (!rect.intersects(event->rect()))
