@@ -109,11 +109,15 @@ Tlogframe::Tlogframe(TDM2* dm, QWidget* parent)
             m_lfBemerkung->trigger();
     });
     connect(m_view, &GridView::keyPressed, this, [this](int key, Qt::KeyboardModifiers) {
-        if (key != Qt::Key_Delete)
+        // Delete removes the focused call; Enter opens it, like a double click.
+        QAction* action = key == Qt::Key_Delete                              ? m_lfDelitem
+                          : (key == Qt::Key_Return || key == Qt::Key_Enter) ? m_lfBemerkung
+                                                                              : nullptr;
+        if (!action)
             return;
         lf_bemerkungUpdate();
-        if (m_lfDelitem->isEnabled())
-            m_lfDelitem->trigger();
+        if (action->isEnabled())
+            action->trigger();
     });
     connect(m_view, &GridView::rowContextMenuRequested, this, &Tlogframe::showPopup);
     connect(m_view, &GridView::columnDraggedOut, this, &Tlogframe::cxGrid1DBTableView1ColumnPosChanged);

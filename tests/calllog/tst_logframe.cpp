@@ -403,6 +403,9 @@ void TstLogFrame::focusedRowDrivesActionsAndMessages()
     action(f, "lf_bemerkung")->trigger();
     env.host().flush();
     QCOMPARE(env.host().of(WMLOGOPENBEMERKUNG).size(), 1);
+    QTest::keyClick(f.view(), Qt::Key_Return);
+    env.host().flush();
+    QCOMPARE(env.host().of(WMLOGOPENBEMERKUNG).size(), 2);
 
     // A group row: nothing is focused for the other windows, both actions go off.
     f.ToGroup(LogGrouping::Caller);
@@ -417,6 +420,7 @@ void TstLogFrame::focusedRowDrivesActionsAndMessages()
     QVERIFY(!action(f, "lf_delitem")->isEnabled());
     env.host().clear();
     QTest::keyClick(f.view(), Qt::Key_Delete);
+    QTest::keyClick(f.view(), Qt::Key_Enter);
     f.resize(800, 300);
     f.show();
     QVERIFY(QTest::qWaitForWindowExposed(&f));
