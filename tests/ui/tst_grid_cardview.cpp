@@ -1,6 +1,8 @@
 #include "tests/support/TestRegistry.h"
 #include "ui/grid/GridCardView.h"
+#include "ui/grid/GridColumnMenu.h"
 #include "ui/grid/GridController.h"
+#include "ui/grid/GridUpdateLock.h"
 #include "ui/grid/MemoryGridSource.h"
 
 #include <QFile>
@@ -10,6 +12,7 @@
 #include <QSignalSpy>
 #include <QTemporaryDir>
 #include <QTest>
+#include <QWheelEvent>
 
 using namespace orvanta;
 
@@ -138,6 +141,12 @@ private Q_SLOTS:
         f.key(Qt::Key_Home);
         QCOMPARE(f.g()->focusedRow(), 0);
         QCOMPARE(f.view.horizontalScrollBar()->value(), 0);
+        // The wheel scrolls the cards sideways.
+        QWheelEvent wheel(QPointF(50, 50), f.view.viewport()->mapToGlobal(QPointF(50, 50)), {}, QPoint(0, -120),
+                          Qt::NoButton, Qt::NoModifier, Qt::NoScrollPhase, false);
+        QApplication::sendEvent(f.view.viewport(), &wheel);
+        QVERIFY(f.view.horizontalScrollBar()->value() > 0);
+        f.view.horizontalScrollBar()->setValue(0);
         f.key(Qt::Key_PageDown); // by the cards on screen
         const int page = f.g()->focusedRow();
         QVERIFY(page >= per);
@@ -267,6 +276,24 @@ private Q_SLOTS:
         QCOMPARE(menu.actions().first()->text(), QStringLiteral("Ort"));
         menu.actions().first()->toggle();
         QVERIFY(!f.view.isRowVisible(f.ort));
+
+        // The frames' "Ansicht" menu drives rows by Tag as it drives table columns.
+        QMenu popup;
+        GridColumnMenu view(&f.view, &popup, QStringLiteral("CVUM"));
+        QAction* plz = view.addEntry(QStringLiteral("CVUM7"), QStringLiteral("PLZ/Ort"), 18);
+        QAction* ort = view.addEntry(QStringLiteral("CVUM8"), QStringLiteral("Ort"), 19);
+        view.checkVisibleColumns();
+        QVERIFY(plz->isChecked());
+        QVERIFY(!ort->isChecked());
+        plz->trigger();
+        QVERIFY(!f.view.isRowVisible(f.plz));
+        ort->trigger();
+        QVERIFY(f.view.isRowVisible(f.ort));
+        {
+            const GridUpdateLock lock(&f.view);
+            QVERIFY(!f.view.viewport()->updatesEnabled());
+        }
+        QVERIFY(f.view.viewport()->updatesEnabled());
     }
 
     void layoutStoreRoundTripAndDamagedFiles()

@@ -12,6 +12,7 @@
 #include <QMenu>
 #include <QPainter>
 #include <QScrollBar>
+#include <QWheelEvent>
 
 #include <algorithm>
 
@@ -424,6 +425,12 @@ void GridCardView::scrollContentsBy(int, int)
 }
 
 // --- input -----------------------------------------------------------------------------------
+
+// The cards only scroll sideways, so the wheel scrolls them sideways.
+void GridCardView::wheelEvent(QWheelEvent* event)
+{
+    QApplication::sendEvent(horizontalScrollBar(), event);
+}
 
 void GridCardView::mousePressEvent(QMouseEvent* event)
 {
