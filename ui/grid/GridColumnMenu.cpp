@@ -17,6 +17,26 @@ GridColumnMenu::GridColumnMenu(GridView* view, QMenu* popup, const QString& menu
     m_menu->setObjectName(menuName);
 }
 
+GridColumnMenu::GridColumnMenu(GridCardView* view, QMenu* popup, const QString& menuName, QObject* parent)
+    : QObject(parent)
+    , m_cards(view)
+    , m_menu(popup->addMenu(QStringLiteral("Ansicht")))
+{
+    m_menu->setObjectName(menuName);
+}
+
+GridController* GridColumnMenu::controller() const
+{
+    return m_view ? m_view->controller() : m_cards->controller();
+}
+
+GridUpdateLock GridColumnMenu::lockView() const
+{
+    if (m_view)
+        return GridUpdateLock(m_view);
+    return GridUpdateLock(m_cards);
+}
+
 QAction* GridColumnMenu::addEntry(const QString& objectName, const QString& caption, int tag)
 {
     QAction* a = m_menu->addAction(caption);
@@ -44,8 +64,8 @@ QAction* GridColumnMenu::entryByTag(int tag) const
 
 void GridColumnMenu::setColumnVisible(bool visible, int tag)
 {
-    const GridUpdateLock lock(m_view);
-    GridController* g = m_view->controller();
+    const GridUpdateLock lock = lockView();
+    GridController* g = controller();
     const int c = g->columnByTag(tag);
     if (c >= 0)
         g->setColumnVisible(c, visible);
@@ -53,9 +73,9 @@ void GridColumnMenu::setColumnVisible(bool visible, int tag)
 
 void GridColumnMenu::checkVisibleColumns()
 {
-    const GridUpdateLock lock(m_view);
+    const GridUpdateLock lock = lockView();
     const QSignalBlocker block(m_menu);
-    const GridController* g = m_view->controller();
+    const GridController* g = controller();
     for (const int c : g->visibleColumns()) {
         const int tag = g->column(c).tag;
         if (tag == 0)
@@ -67,7 +87,7 @@ void GridColumnMenu::checkVisibleColumns()
 
 void GridColumnMenu::columnDraggedOut(int column)
 {
-    const GridController* g = m_view->controller();
+    const GridController* g = controller();
     if (column < 0 || column >= g->columnCount() || g->isColumnVisible(column))
         return;
     const int tag = g->column(column).tag;

@@ -1,7 +1,7 @@
 #pragma once
 // The "Ansicht" submenu of a list's context menu: one check entry per column, tied to the
 // column by its Tag (a column with Tag 0 has no entry). A click toggles the entry's check mark
-// and, by default, shows or hides the first column with that Tag.
+// and, by default, shows or hides the first column with that Tag (on a card view: the row).
 
 #include <QList>
 #include <QObject>
@@ -13,6 +13,9 @@ class QMenu;
 
 namespace orvanta {
 
+class GridCardView;
+class GridController;
+class GridUpdateLock;
 class GridView;
 
 class GridColumnMenu final : public QObject {
@@ -22,6 +25,7 @@ class GridColumnMenu final : public QObject {
 public:
     // Appends the submenu "Ansicht" (objectName: menuName) to popup.
     GridColumnMenu(GridView* view, QMenu* popup, const QString& menuName, QObject* parent = nullptr);
+    GridColumnMenu(GridCardView* view, QMenu* popup, const QString& menuName, QObject* parent = nullptr);
 
     QAction* addEntry(const QString& objectName, const QString& caption, int tag);
     [[nodiscard]] QMenu* menu() const { return m_menu; }
@@ -40,7 +44,11 @@ public:
     void withdrawEntry(const QString& objectName);
 
 private:
-    GridView* m_view;
+    [[nodiscard]] GridController* controller() const;
+    [[nodiscard]] GridUpdateLock lockView() const;
+
+    GridView* m_view = nullptr;
+    GridCardView* m_cards = nullptr;
     QMenu* m_menu;
     QList<QAction*> m_entries;
     std::function<void(QAction*)> m_onClick;
