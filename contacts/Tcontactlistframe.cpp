@@ -2,6 +2,7 @@
 
 #include "contacts/ContactAnchors.h"
 #include "contacts/ContactSummary.h"
+#include "contacts/Tnotizviewform.h"
 #include "db/TDM2.h"
 #include "db/TDM2Statements.h"
 #include "dbgrid/RecordStoreGridSource.h"
@@ -64,6 +65,7 @@ Tcontactlistframe::Tcontactlistframe(TDM2* dm, QWidget* parent)
     buildLayout();
     buildColumns();
     buildActions();
+    m_noteOpener = [this](int lid) { Tnotizviewform::showNote(m_dm, lid); };
     m_t1 = new QTimer(this);
     m_t1->setObjectName(QStringLiteral("T1"));
     m_t1->setInterval(50);
@@ -402,6 +404,7 @@ void Tcontactlistframe::DBDisconnect()
 {
     try {
         m_t1->stop();
+        Tnotizviewform::closeInstance();
         postMessage(m_host, WMSEARCHUNCHECKED, 0, 0);
         DataSet* ds = dataSetOf(m_viewKind);
         if (ds && ds->isActive() && controller()->source()) {

@@ -87,7 +87,7 @@ public:
     [[nodiscard]] int summaryRebuilds() const { return m_summaryRebuilds; }
     // A click on an anchor of the summary.
     void HTMLStaticText1AnchorClick(const QString& href);
-    // Who opens the notes of a contact (the host); nothing happens without one.
+    // Who opens the notes of a contact; the notes window unless replaced.
     void setNoteOpener(std::function<void(int lid)> opener) { m_noteOpener = std::move(opener); }
 
     // --- parts ------------------------------------------------------------------------------

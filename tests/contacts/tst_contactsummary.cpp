@@ -3,13 +3,17 @@
 #include "contacts/ContactDeletion.h"
 #include "contacts/ContactSummary.h"
 #include "contacts/Tcontactlistframe.h"
+#include "contacts/Tnotizviewform.h"
 #include "db/TDM2.h"
 #include "tests/contacts/ContactTestEnv.h"
 #include "tests/support/TestRegistry.h"
 #include "ui/grid/GridController.h"
 #include "ui/markup/MarkupPanel.h"
 
+#include <QLabel>
+#include <QPushButton>
 #include <QTest>
+#include <QTextEdit>
 #include <QTextDocument>
 
 using namespace orvanta;
@@ -160,6 +164,39 @@ private Q_SLOTS:
         QCOMPARE(env.dialogs().count(), 0);
         setUrlOpener({});
         f.DBDisconnect();
+    }
+
+    void notesWindowFollowsTheAnchors()
+    {
+        ContactTestEnv env;
+        ContactTestEnv::Contact c;
+        c.lid = 3;
+        c.contbez = QStringLiteral("Bäcker \"Ost\"");
+        c.notiz = QStringLiteral("{\\rtf1\\ansi Hallo Welt\\par}");
+        env.addContact(c);
+        env.add(4, QStringLiteral("Leer"));
+        Tcontactlistframe f(&env.dm());
+        QVERIFY(f.DBConnect(&env.host()));
+        f.HTMLStaticText1AnchorClick(QStringLiteral("Notiz_3"));
+        Tnotizviewform* w = Tnotizviewform::instance();
+        QVERIFY(w);
+        QCOMPARE(w->findChild<QLabel*>(QStringLiteral("L1"))->text(),
+                 QStringLiteral("Notizen zum Kontakt \"Bäcker \"Ost\"\""));
+        QCOMPARE(w->noteView()->toPlainText().trimmed(), QStringLiteral("Hallo Welt"));
+        QVERIFY(w->findChild<QPushButton*>(QStringLiteral("RzB2"))->isEnabled());
+        QCOMPARE(w->loads(), 1);
+        // The same contact again only brings the window forward; another one reloads in place.
+        f.HTMLStaticText1AnchorClick(QStringLiteral("Notiz_3"));
+        QCOMPARE(w->loads(), 1);
+        f.HTMLStaticText1AnchorClick(QStringLiteral("Notiz_4"));
+        QCOMPARE(Tnotizviewform::instance(), w);
+        QCOMPARE(w->loads(), 2);
+        QVERIFY(w->findChild<QPushButton*>(QStringLiteral("RzB2"))->isEnabled());
+        QVERIFY(w->noteView()->toPlainText().isEmpty());
+        QVERIFY(!env.dm().BlobTS.isActive());
+        // Leaving the list closes it.
+        f.DBDisconnect();
+        QTRY_VERIFY(!Tnotizviewform::instance());
     }
 
     void cardRowTexts()
