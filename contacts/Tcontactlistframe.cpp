@@ -517,7 +517,7 @@ bool Tcontactlistframe::ChangeView(int kind)
     } catch (const std::exception& e) {
         BusyCursor::resetCursor();
         reportError(kLabel + QStringLiteral("ChangeView"), &e);
-        return true;
+        return false;
     }
     SyncFilterState();
     SetTableViewPopup();

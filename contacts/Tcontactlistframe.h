@@ -53,6 +53,7 @@ public:
     bool DBConnect(QObject* mainWindow) override;
     void DBDisconnect() override;
     [[nodiscard]] bool isConnected() const override;
+    // False when the new view could not be opened (reported).
     bool ChangeView(int kind) override;
     void ToGroup(int kind) override;
     void Refresh_View(int lid) override;

@@ -5,6 +5,7 @@
 #include "platform/ErrorLog.h"
 #include "ui/dialogs/BusyCursor.h"
 #include "ui/rtf/RtfReader.h"
+#include "ui/rtf/RtfWriter.h"
 
 #include <QFrame>
 #include <QHBoxLayout>
@@ -24,6 +25,12 @@ QPointer<Tnotizviewform>& theInstance()
 }
 
 const QString kLabel = QStringLiteral("# Notizanzeige - GetNotizData\r\n");
+
+Tnotizviewform::NotePrinter& printer()
+{
+    static Tnotizviewform::NotePrinter p;
+    return p;
+}
 
 } // namespace
 
@@ -78,6 +85,7 @@ Tnotizviewform::Tnotizviewform(TDM2* dm, int contactLid, QWidget* parent)
     status->setObjectName(QStringLiteral("dxStatusBar1"));
     box->addWidget(status);
     connect(m_close, &QPushButton::clicked, this, &QWidget::close);
+    connect(m_print, &QPushButton::clicked, this, &Tnotizviewform::RzB2Click);
 }
 
 Tnotizviewform::~Tnotizviewform()
@@ -104,6 +112,21 @@ Tnotizviewform* Tnotizviewform::showNote(TDM2* dm, int lid)
     theInstance() = w;
     w->show();
     return w;
+}
+
+void Tnotizviewform::setNotePrinter(NotePrinter p)
+{
+    printer() = std::move(p);
+}
+
+void Tnotizviewform::RzB2Click()
+{
+    if (m_contbez.isEmpty()) {
+        reportError(QStringLiteral("Es konnte keine Kontaktbezeichnung ermittelt werden."));
+        return;
+    }
+    if (printer())
+        (void)printer()(m_contbez, RtfWriter::write(*m_notiz1->document()));
 }
 
 void Tnotizviewform::closeInstance()
@@ -163,15 +186,19 @@ bool Tnotizviewform::GetNotizData()
             reportError(kLabel + QStringLiteral("Datenbankabfrage konnte nicht ausgeführt werden.\r\n"
                                                 "Notiz kann nicht angezeigt werden."));
         } else {
-            if (q.rowCount() > 0) {
+            // A contact deleted meanwhile has no note to show: the window stays empty.
+            ok = q.rowCount() > 0;
+            if (ok) {
                 q.first();
                 const int notiz = q.fieldIndex(u"NOTIZ");
                 const QByteArray rtf = notiz >= 0 ? q.store().bytes(0, notiz).toByteArray() : QByteArray();
-                if (!rtf.isEmpty())
+                // A note some other program stored as plain text is shown as such.
+                if (RtfReader::isRtf(rtf))
                     RtfReader::read(rtf, m_notiz1->document());
+                else if (!rtf.isEmpty())
+                    m_notiz1->setPlainText(QString::fromLatin1(rtf));
                 m_contbez = q.fieldByName(u"CONTBEZ").asString();
             }
-            ok = true;
         }
     } catch (const std::exception& e) {
         reportError(kLabel + QStringLiteral("Notiz kann nicht angezeigt werden."), &e);

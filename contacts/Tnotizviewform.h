@@ -5,6 +5,8 @@
 #include <QPointer>
 #include <QWidget>
 
+#include <functional>
+
 class QLabel;
 class QPushButton;
 class QTextEdit;
@@ -28,11 +30,18 @@ public:
     // Closes the open window, if any.
     static void closeInstance();
 
+    // Prints a note: the designation and the note's RTF; false when printing failed (the printer
+    // reports its own errors). Until the printing is installed "Drucken" prints nothing.
+    using NotePrinter = std::function<bool(const QString& designation, const QByteArray& rtf)>;
+    static void setNotePrinter(NotePrinter printer);
+
     // Loads another contact's note; the same contact or a key below 1 changes nothing.
     void SetContactLID(int lid);
     // Reads the note into the view; false when it could not be read.
     bool GetNotizData();
     void ClearContent();
+    // "Drucken".
+    void RzB2Click();
 
     [[nodiscard]] int contactLid() const { return m_lid; }
     [[nodiscard]] const QString& designation() const { return m_contbez; }

@@ -156,11 +156,15 @@ private Q_SLOTS:
             f.DBDisconnect();
         }
         env.writeFile(QStringLiteral("VStore"), "[Level_GV]\r\nValue=5\r\nPercent=40\r\n");
+        // A damaged table layout naming columns that do not exist leaves the designed one.
+        env.writeFile(QStringLiteral("VStoreT"), QByteArray("[1]\r\nTag=x\r\nNoSuchColumn.Width=abc\r\n\x01\xff[[\r\n"));
         Tcontactlistframe f(&env.dm());
         f.resize(800, 600);
         QVERIFY(f.DBConnect(&env.host()));
         QCOMPARE(f.activeView(), 1);
         QCOMPARE(f.splitterPercent(), 40);
+        QCOMPARE(f.captionText(), QStringLiteral("Kontakte (alle)"));
+        QCOMPARE(names(f), QStringList{QStringLiteral("Anna")});
         f.DBDisconnect();
     }
 

@@ -194,6 +194,21 @@ private Q_SLOTS:
         QVERIFY(w->findChild<QPushButton*>(QStringLiteral("RzB2"))->isEnabled());
         QVERIFY(w->noteView()->toPlainText().isEmpty());
         QVERIFY(!env.dm().BlobTS.isActive());
+        // "Drucken" hands designation and note to the printing.
+        QString printed;
+        Tnotizviewform::setNotePrinter([&printed](const QString& designation, const QByteArray& rtf) {
+            printed = designation + QLatin1Char('|') + QString::number(rtf.startsWith("{\\rtf"));
+            return true;
+        });
+        w->findChild<QPushButton*>(QStringLiteral("RzB2"))->click();
+        QCOMPARE(printed, QStringLiteral("Leer|1"));
+        Tnotizviewform::setNotePrinter({});
+        // A contact deleted meanwhile leaves an empty window.
+        env.db().exec(QStringLiteral("DELETE FROM ADDR WHERE CID = 3"));
+        env.db().exec(QStringLiteral("DELETE FROM CONTACT WHERE LID = 3"));
+        f.HTMLStaticText1AnchorClick(QStringLiteral("Notiz_3"));
+        QVERIFY(w->designation().isEmpty());
+        QVERIFY(w->findChild<QLabel*>(QStringLiteral("L1"))->text().isEmpty());
         // Leaving the list closes it.
         f.DBDisconnect();
         QTRY_VERIFY(!Tnotizviewform::instance());
