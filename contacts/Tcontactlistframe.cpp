@@ -195,10 +195,7 @@ void Tcontactlistframe::buildLayout()
     m_scrollBox4->setWidgetResizable(true);
     m_summary = new MarkupPanel(m_scrollBox4);
     m_summary->setObjectName(QStringLiteral("HTMLStaticText1"));
-    QPixmap contactImage(24, 24);
-    contactImage.fill(Qt::transparent);
-    contactImage = style()->standardIcon(QStyle::SP_FileDialogInfoView).pixmap(24, 24);
-    m_summary->setImages({contactImage});
+    m_summary->setImages({style()->standardIcon(QStyle::SP_FileDialogInfoView).pixmap(24, 24)});
     m_summary->setText(kEmptySummary);
     m_scrollBox4->setWidget(m_summary);
     m_splitter->addWidget(m_scrollBox4);
@@ -902,19 +899,17 @@ QString Tcontactlistframe::footerText() const
 
 void Tcontactlistframe::cv_editcontUpdate()
 {
-    const bool connected = m_dm && m_dm->IBDatabase1.isConnected() && m_connected;
-    const bool selected = connected && m_dm->SelectedLID != -1;
-    m_newCont->setEnabled(connected);
-    m_editCont->setEnabled(selected);
-    m_deleteCont->setEnabled(selected);
+    for (QAction* a : {m_newCont, m_editCont, m_deleteCont})
+        a->setEnabled(isActionEnabled(a->objectName()));
 }
 
 bool Tcontactlistframe::isActionEnabled(const QString& actionName) const
 {
-    const_cast<Tcontactlistframe*>(this)->cv_editcontUpdate();
-    for (const QAction* a : {m_newCont, m_editCont, m_deleteCont})
-        if (a->objectName() == actionName)
-            return a->isEnabled();
+    const bool connected = m_connected && m_dm && m_dm->IBDatabase1.isConnected();
+    if (actionName == m_newCont->objectName())
+        return connected;
+    if (actionName == m_editCont->objectName() || actionName == m_deleteCont->objectName())
+        return connected && m_dm->SelectedLID != -1;
     return false;
 }
 
