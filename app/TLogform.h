@@ -101,6 +101,7 @@ public:
     [[nodiscard]] WindowSlots& editWindows() { return m_windows.editWindows(); }
     [[nodiscard]] ObjectSlots<TvkMiniKontakt>& contactRecords() { return m_windows.contactRecords(); }
     [[nodiscard]] WindowSlots& logDetailWindows() { return m_windows.logDetailWindows(); }
+    [[nodiscard]] const WindowRegistries& windowRegistries() const { return m_windows; }
     // Puts a log detail window for the call into the registry (or brings an open one forward).
     int CreateLogDetailFo(int logKey);
     [[nodiscard]] bool IfLogDetailArrayAllFree();

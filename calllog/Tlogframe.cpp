@@ -2,7 +2,7 @@
 
 #include "calllog/LogImages.h"
 #include "calllog/LogStatements.h"
-#include "calllog/RecordStoreGridSource.h"
+#include "dbgrid/RecordStoreGridSource.h"
 #include "db/TDM2.h"
 #include "db/TDM2Statements.h"
 #include "db/TransactionWork.h"

@@ -1,6 +1,6 @@
 #pragma once
 // The grid's view of a fetched result: answers every cell straight from the data set's record
-// store, so the log list never copies a row. The store object must outlive the source; its
+// store, so a list frame never copies a row. The store object must outlive the source; its
 // content may change (a re-read), after which the grid is told through sourceChanged().
 
 #include "db/RecordStore.h"

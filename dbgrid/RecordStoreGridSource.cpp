@@ -1,4 +1,4 @@
-#include "calllog/RecordStoreGridSource.h"
+#include "dbgrid/RecordStoreGridSource.h"
 
 namespace orvanta {
 namespace {

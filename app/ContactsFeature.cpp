@@ -1,0 +1,57 @@
+#include "app/ContactsFeature.h"
+
+#include "app/AppServices.h"
+#include "app/TLogform.h"
+#include "contacts/ContactDeletion.h"
+#include "contacts/Tcontactlistframe.h"
+
+namespace orvanta {
+
+namespace {
+
+bool contactChosen(const TLogform& w)
+{
+    const ContactListFrame* f = w.contactFrame();
+    return f && f->isConnected() && f->GetSelectedLID() > 0;
+}
+
+void ContDelExecute(TLogform& w)
+{
+    ContactListFrame* frame = w.contactFrame();
+    const int lid = frame ? frame->GetSelectedLID() : -1;
+    if (lid <= 0) {
+        informationBox(QStringLiteral("Kein Kontakt ausgewählt."));
+        return;
+    }
+    const WindowRegistries& windows = w.windowRegistries();
+    if (const int slot = windows.recordSlotOf(lid); slot >= 0) {
+        warningBox(QStringLiteral("Der zum Löschen ausgewählte Kontakt ist derzeit\r\nnoch in Bearbeitung."));
+        if (QWidget* editor = windows.editWindowOfRecord(slot)) {
+            editor->show();
+            editor->raise();
+            editor->activateWindow();
+        }
+        return;
+    }
+    if (!askWarning(QStringLiteral("Soll der Kontakt \"") + frame->GetSelectedContBez()
+                    + QStringLiteral("\" gelöscht werden?")))
+        return;
+    if (!w.dataModule() || !DeleteDS(*w.dataModule(), lid))
+        return;
+    if (ContactListFrame* f = w.contactFrame())
+        f->Refresh_View(0);
+}
+
+} // namespace
+
+void registerContactsFeature(TLogform& w)
+{
+    TDM2* dm = w.dataModule();
+    w.factories().contactFrame = [dm](QWidget* parent) -> ContactListFrame* {
+        return new Tcontactlistframe(dm, parent);
+    };
+    w.actions().define(QStringLiteral("_LogFo_ContDel"), [&w] { ContDelExecute(w); },
+                       [&w] { return contactChosen(w); });
+}
+
+} // namespace orvanta

@@ -1,0 +1,18 @@
+#pragma once
+// The statements the contact list, its summary and the contact deletion run; named here so the
+// tests prepare exactly the text the program runs. The list and card queries themselves are the
+// data module's (dmsql::kSelectContactList, dmsql::kSelectContactCards).
+
+namespace orvanta::contactsql {
+
+// Summary: one contact with address and category, its numbers, its e-mail addresses. Each is
+// two lines, as the detail query has always been given them.
+inline constexpr const char* kSelectDetail = "SELECT * FROM V_SELECT_DETAIL\r\nWHERE LID = :id";
+inline constexpr const char* kSelectNumbers = "SELECT * FROM COM\r\nWHERE CID = :id";
+inline constexpr const char* kSelectMails = "SELECT * FROM E_MAIL\r\nWHERE CID = :id";
+// Notes window: the rich-text note of one contact.
+inline constexpr const char* kSelectNote = "SELECT * FROM V_SELECT_NOTIZ\r\nWHERE LID = :ID";
+// Deleting a contact with its numbers, addresses and category link.
+inline constexpr const char* kDeleteContact = "EXECUTE PROCEDURE P_CONT_DELETE(:D_LID)";
+
+} // namespace orvanta::contactsql
