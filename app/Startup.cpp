@@ -6,9 +6,15 @@
 #include "calllog/LogMaintenance.h"
 #include "db/TDM2.h"
 #include "platform/NamedMutex.h"
+#include "platform/TerminationSignals.h"
 #include "ui/dialogs/MessageBoxDialogService.h"
 
 #include <QApplication>
+#include <QDialog>
+#include <QPointer>
+#include <QTimer>
+
+#include <functional>
 
 namespace orvanta {
 
@@ -38,6 +44,29 @@ int Startup::run(int argc, char* argv[])
     QApplication::setApplicationVersion(QStringLiteral(ORVANTA_VERSION));
     MessageBoxDialogService messageBoxes;
     setDialogService(&messageBoxes);
+
+    // SIGTERM/SIGINT end the run as a close of the main window does. Modal dialogs go first,
+    // one per turn of the event loop, so that the code that opened each one goes on before
+    // the window closes under it.
+    TerminationSignals termination;
+    QPointer<QWidget> mainWindow;
+    bool terminating = false;
+    int attempts = 0;
+    std::function<void()> endRun = [&] {
+        terminating = true;
+        if (QWidget* modal = QApplication::activeModalWidget(); modal && ++attempts < 100) {
+            if (auto* dialog = qobject_cast<QDialog*>(modal))
+                dialog->reject();
+            else
+                modal->close();
+            QTimer::singleShot(0, &app, endRun);
+            return;
+        }
+        if (mainWindow)
+            mainWindow->close();
+    };
+    QObject::connect(&termination, &TerminationSignals::terminationRequested, &app, [&endRun] { endRun(); });
+
     int code = 0;
     {
         TDM2 dm;
@@ -45,7 +74,10 @@ int Startup::run(int argc, char* argv[])
         parameters.removeFirst();
         {
             TLogform window(&dm, parameters, defaultMainWindowFeatures());
+            mainWindow = &window;
             window.show();
+            if (terminating)
+                QTimer::singleShot(0, &window, &QWidget::close);
             code = QApplication::exec();
         }
         // The data module closes its data sets and the connection here.

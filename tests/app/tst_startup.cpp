@@ -4,9 +4,13 @@
 #include "tests/support/TestRegistry.h"
 
 #include <QElapsedTimer>
+#include <QFile>
+#include <QFileInfo>
 #include <QProcess>
 #include <QTemporaryDir>
 #include <QTest>
+
+#include <csignal>
 
 using namespace orvanta;
 
@@ -75,7 +79,51 @@ private Q_SLOTS:
         first.waitForFinished(5000);
     }
 
+    void terminationEndsTheRunEvenUnderAMessageBox()
+    {
+        const QString built = QStringLiteral(ORVANTA_BIN_DIR "/orvanta");
+        QVERIFY2(QFileInfo::exists(built), "the orvanta program is missing from the build");
+        QTemporaryDir folder;
+        const QString program = folder.filePath(QStringLiteral("orvanta"));
+        QVERIFY(QFile::copy(built, program));
+        QProcessEnvironment env = QProcessEnvironment::systemEnvironment();
+        env.insert(QStringLiteral("QT_QPA_PLATFORM"), QStringLiteral("offscreen"));
+        env.insert(QStringLiteral("VARNIK_HKLM"), folder.filePath(QStringLiteral("none.ini")));
+
+        for (const int signalNumber : {SIGTERM, SIGINT}) {
+            // Without a database the run stops in its first error box; the missing database, the
+            // missing area-code files and "/co-x" have more boxes queued behind it.
+            QProcess run;
+            run.setProcessEnvironment(env);
+            run.start(program, {QStringLiteral("/co-x")});
+            QVERIFY(run.waitForStarted());
+            const QString log = folder.filePath(QStringLiteral("OXError.log"));
+            QTRY_VERIFY_WITH_TIMEOUT(NamedMutex::isHeld(QString::fromLatin1(Startup::InstanceMutexName)), 15000);
+            QTest::qWait(1500);
+            QCOMPARE(run.state(), QProcess::Running);
+
+            QElapsedTimer t;
+            t.start();
+            ::kill(static_cast<pid_t>(run.processId()), signalNumber);
+            QVERIFY(run.waitForFinished(2000));
+            QVERIFY(t.elapsed() < 2000);
+            QCOMPARE(run.exitStatus(), QProcess::NormalExit);
+            QCOMPARE(run.exitCode(), 0);
+            // The run ended through its tear-down: every queued box was passed (the last one is
+            // the parameter check's), and the instance lock is free again.
+            QVERIFY(readFile(log).contains("Übergabeparameter ist nicht korrekt!"));
+            QVERIFY(!NamedMutex::isHeld(QString::fromLatin1(Startup::InstanceMutexName)));
+            QFile::remove(log);
+        }
+    }
+
 private:
+    static QByteArray readFile(const QString& path)
+    {
+        QFile f(path);
+        return f.open(QIODevice::ReadOnly) ? QString::fromLatin1(f.readAll()).toUtf8() : QByteArray();
+    }
+
     std::unique_ptr<QTemporaryDir> m_runtime;
 };
 
