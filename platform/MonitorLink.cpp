@@ -1,5 +1,7 @@
 #include "platform/MonitorLink.h"
 
+#include "platform/RuntimeFolder.h"
+
 #include "platform/WindowMessages.h"
 
 #include <QDir>
@@ -28,10 +30,7 @@ MonitorLink::~MonitorLink()
 
 QString MonitorLink::runtimeFolder()
 {
-    const QString dir = qEnvironmentVariable("XDG_RUNTIME_DIR");
-    if (!dir.isEmpty() && QFileInfo(dir).isDir())
-        return QDir(dir).absolutePath();
-    return QDir::tempPath();
+    return userRuntimeFolder();
 }
 
 QString MonitorLink::programSocketPath()

@@ -1,5 +1,7 @@
 #include "platform/NamedMutex.h"
 
+#include "platform/RuntimeFolder.h"
+
 #include <QCryptographicHash>
 #include <QFileInfo>
 
@@ -86,11 +88,8 @@ QString NamedMutex::lockFilePath(const QString& name)
     const QByteArray digest = QCryptographicHash::hash(name.toUtf8(), QCryptographicHash::Sha1).toHex().left(8);
     const QString fileName = safe.left(64) + u'-' + QString::fromLatin1(digest) + QStringLiteral(".lock");
 
-    const QString runtime = qEnvironmentVariable("XDG_RUNTIME_DIR");
-    if (!runtime.isEmpty() && QFileInfo(runtime).isDir())
-        return runtime + QStringLiteral("/orvanta-") + fileName;
-    // /tmp is shared by all users; the mutex is per user as on Windows.
-    return QStringLiteral("/tmp/orvanta-%1-").arg(::getuid()) + fileName;
+    // The mutex is per user as on Windows.
+    return userRuntimeFolder() + QStringLiteral("/orvanta-") + fileName;
 }
 
 } // namespace orvanta

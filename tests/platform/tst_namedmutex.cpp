@@ -2,6 +2,8 @@
 #include "tests/support/TestRegistry.h"
 
 #include <QTemporaryDir>
+#include <QDir>
+#include <QFileInfo>
 #include <QTest>
 
 #include <sys/wait.h>
@@ -113,6 +115,24 @@ private Q_SLOTS:
         mine.reset();
         OtherProcess other(name);
         QCOMPARE(other.state(), 'H');
+    }
+
+    void withoutARuntimeFolderTheLockIsInAPrivateOne()
+    {
+        // Another user's lock in a folder all users share would end this user's start silently.
+        qunsetenv("XDG_RUNTIME_DIR");
+        const QFileInfo folder(QFileInfo(NamedMutex::lockFilePath(QStringLiteral("Varnik Orvanta"))).path());
+        {
+            NamedMutex held(QStringLiteral("Varnik Orvanta"));
+            QVERIFY(held.isOwned());
+        }
+        qputenv("XDG_RUNTIME_DIR", m_runtime.path().toUtf8());
+        QVERIFY(folder.isDir());
+        QVERIFY(folder.absoluteFilePath() != QDir::tempPath());
+        QCOMPARE(folder.ownerId(), ::getuid());
+        const auto shared = QFile::ReadGroup | QFile::WriteGroup | QFile::ExeGroup | QFile::ReadOther
+            | QFile::WriteOther | QFile::ExeOther;
+        QCOMPARE(folder.permissions() & shared, QFileDevice::Permissions());
     }
 
     void namesAreKeptApartAndFileSafe()
