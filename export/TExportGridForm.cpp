@@ -127,8 +127,9 @@ public:
     QLineEdit* edit() const { return m_e1; }
     void Firststep(const QString& folder, const QString& name)
     {
-        if (!folder.isEmpty()) {
-            const QModelIndex index = m_model->index(folder);
+        // Nothing chosen yet: start at the home folder, where the export goes without a choice.
+        {
+            const QModelIndex index = m_model->index(folder.isEmpty() ? QDir::homePath() : folder);
             m_tree->setCurrentIndex(index);
             m_tree->scrollTo(index);
         }
@@ -225,14 +226,16 @@ TExportGridForm::TExportGridForm(GridController* grid, QWidget* parent, QStringL
     auto* top = new QHBoxLayout;
     auto* p2 = new QWidget(this);
     p2->setObjectName(QStringLiteral("P2"));
-    p2->setFixedWidth(120);
+    p2->setFixedWidth(72);
     p2->setAutoFillBackground(true);
     auto* image = new QLabel(p2);
     image->setObjectName(QStringLiteral("Image1"));
     top->addWidget(p2);
     m_host = new QWidget(this);
     m_host->setObjectName(QStringLiteral("P3"));
-    m_host->setLayout(new QVBoxLayout);
+    auto* hostLayout = new QVBoxLayout;
+    hostLayout->setContentsMargins(4, 8, 8, 0);
+    m_host->setLayout(hostLayout);
     top->addWidget(m_host, 1);
     outer->addLayout(top, 1);
     auto* p1 = new QWidget(this);
