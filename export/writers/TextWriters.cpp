@@ -5,6 +5,8 @@
 #include <QIODevice>
 #include <QSet>
 
+#include <algorithm>
+
 namespace orvanta {
 
 namespace {
@@ -24,6 +26,14 @@ bool isXmlChar(char32_t c)
 
 QByteArray escapeMarkup(const QString& text)
 {
+    // Most cells hold nothing to replace: encode them directly.
+    const bool plain = std::all_of(text.begin(), text.end(), [](QChar ch) {
+        const char16_t c = ch.unicode();
+        return (c >= 0x20 || c == '\t' || c == '\n') && c != '<' && c != '>' && c != '&' && c != '"' && c != '\''
+            && !ch.isSurrogate() && c < 0xFFFE;
+    });
+    if (plain)
+        return text.toUtf8();
     QString clean;
     clean.reserve(text.size());
     for (const char32_t c : text.toUcs4()) {
