@@ -81,8 +81,7 @@ void registerCallLogFeature(TLogform& w)
 
     ActionRegistry& actions = w.actions();
     const auto ready = [&w] { return logFrameReady(w); };
-    for (const QString& name : {QStringLiteral("_LogFo_Print"), QStringLiteral("_LogFo_Export")})
-        actions.define(name, [&w, name] { w.forwardToFrame(name); }, ready);
+    actions.define(QStringLiteral("_LogFo_Print"), [&w] { w.forwardToFrame(QStringLiteral("_LogFo_Print")); }, ready);
     actions.define(QStringLiteral("_LogFo_DelLog"), [&w] { DelLogExecute(w); }, ready);
     actions.define(QStringLiteral("_LogFo_DelDayLog"), [&w] { DelDayLogExecute(w); },
                    [&w] { return logFrameReady(w) && w.navBar()->activeTabIndex() == TLogform::TabCalendar; });

@@ -2,13 +2,14 @@
 
 #include "app/CallLogFeature.h"
 #include "app/ContactsFeature.h"
+#include "app/ExportFeature.h"
 
 namespace orvanta {
 
 std::vector<MainWindowFeature> defaultMainWindowFeatures()
 {
     // A view whose frame no feature provides shows an empty frame.
-    return {registerCallLogFeature, registerContactsFeature};
+    return {registerCallLogFeature, registerContactsFeature, registerExportFeature};
 }
 
 } // namespace orvanta

@@ -1,0 +1,75 @@
+// "Exportieren..." of the log list: the wizard over the log grid of a real database, with the
+// internal ABID column hidden while it is open, left out of the file and shown again afterwards.
+#include "app/MainWindowFeatures.h"
+#include "app/TLogform.h"
+#include "calllog/Tlogframe.h"
+#include "export/TExportGridForm.h"
+#include "tests/app/AppTestEnv.h"
+#include "tests/support/TestRegistry.h"
+#include "ui/grid/GridController.h"
+
+#include <QAction>
+#include <QApplication>
+#include <QFileSystemModel>
+#include <QLineEdit>
+#include <QPushButton>
+#include <QTest>
+#include <QTimer>
+#include <QTreeView>
+
+using namespace orvanta;
+
+class TestExportFeature : public QObject {
+    Q_OBJECT
+
+private Q_SLOTS:
+    void exportsTheLogGridWithoutAbid()
+    {
+        test::AppTestEnv env;
+        env.addCall(1, QStringLiteral("2024-05-14"), QStringLiteral("0301111"), QStringLiteral("Müller & Söhne"));
+        env.addCall(2, QStringLiteral("2024-05-14"), QStringLiteral("0302222"), QStringLiteral("<Abel>"));
+        std::vector<MainWindowFeature> f = defaultMainWindowFeatures();
+        f.push_back(test::plainWindows());
+        TLogform& w = env.window({}, f);
+        w.show();
+        auto* frame = dynamic_cast<Tlogframe*>(w.logFrame());
+        QVERIFY(frame);
+        GridController* grid = frame->controller();
+        const int abid = grid->columnByField(u"ABID");
+        QVERIFY(abid >= 0);
+        grid->setColumnVisible(abid, true);
+
+        bool abidVisibleWhileOpen = true;
+        bool walked = false;
+        QTimer::singleShot(0, &w, [&] {
+            auto* form = qobject_cast<TExportGridForm*>(QApplication::activeModalWidget());
+            QVERIFY(form);
+            abidVisibleWhileOpen = grid->isColumnVisible(abid);
+            form->setStartDelay(0);
+            form->findChild<QPushButton*>(QStringLiteral("RzButton2"))->click();
+            QTest::keyClicks(form->findChild<QLineEdit*>(QStringLiteral("E1")), QStringLiteral("Anrufe"));
+            auto* tree = form->findChild<QTreeView*>(QStringLiteral("cxSTV1"));
+            tree->setCurrentIndex(qobject_cast<QFileSystemModel*>(tree->model())->index(env.folder()));
+            form->findChild<QPushButton*>(QStringLiteral("RzButton2"))->click();
+            QTRY_COMPARE(form->currentPage(), TExportGridForm::PageResult);
+            walked = true;
+            form->findChild<QPushButton*>(QStringLiteral("RzButton2"))->click();
+        });
+        w.updateActions();
+        QAction* action = w.findChild<QAction*>(QStringLiteral("_LogFo_Export"));
+        QVERIFY(action->isEnabled());
+        action->trigger();
+        QVERIFY(walked);
+        QVERIFY(!abidVisibleWhileOpen);
+        QVERIFY(grid->isColumnVisible(abid));
+
+        const QString html = QString::fromUtf8(env.readFile(QStringLiteral("Anrufe.html")));
+        QVERIFY(html.contains(QStringLiteral("Müller &amp; Söhne")));
+        QVERIFY(html.contains(QStringLiteral("&lt;Abel&gt;")));
+        QVERIFY(!html.contains(QStringLiteral("<th>ABID</th>")));
+        QVERIFY(!html.contains(QStringLiteral("<th></th>")));   // the ABID column has no caption
+    }
+};
+
+ORVANTA_TEST(TestExportFeature)
+#include "tst_exportfeature.moc"
