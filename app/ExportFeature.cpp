@@ -2,6 +2,7 @@
 
 #include "app/TLogform.h"
 #include "calllog/Tlogframe.h"
+#include "contacts/Tcontactlistframe.h"
 #include "export/TExportGridForm.h"
 #include "ui/grid/GridController.h"
 
@@ -29,10 +30,23 @@ void LogExportExecute(TLogform& w)
         grid->setColumnVisible(abid, true);
 }
 
+// The contact list's grid as it is shown, table or cards.
+void ContExportExecute(TLogform& w)
+{
+    auto* frame = dynamic_cast<Tcontactlistframe*>(w.contactFrame());
+    GridController* grid = frame ? frame->controller() : nullptr;
+    if (!grid)
+        return;
+    TExportGridForm form(grid, &w);
+    form.exec();
+}
+
 } // namespace
 
 void registerExportFeature(TLogform& w)
 {
+    w.actions().define(QStringLiteral("_LogFo_ContExport"), [&w] { ContExportExecute(w); },
+                       [&w] { return w.contactFrame() && w.contactFrame()->isConnected(); });
     w.actions().define(QStringLiteral("_LogFo_Export"), [&w] { LogExportExecute(w); },
                        [&w] { return w.logFrame() && !w.logFrame()->isBusy(); });
 }

@@ -3,6 +3,7 @@
 #include "app/MainWindowFeatures.h"
 #include "app/TLogform.h"
 #include "calllog/Tlogframe.h"
+#include "contacts/Tcontactlistframe.h"
 #include "export/TExportGridForm.h"
 #include "tests/app/AppTestEnv.h"
 #include "tests/support/TestRegistry.h"
@@ -68,6 +69,48 @@ private Q_SLOTS:
         QVERIFY(html.contains(QStringLiteral("&lt;Abel&gt;")));
         QVERIFY(!html.contains(QStringLiteral("<th>ABID</th>")));
         QVERIFY(!html.contains(QStringLiteral("<th></th>")));   // the ABID column has no caption
+    }
+
+    void exportsTheContactGridAsShown()
+    {
+        test::AppTestEnv env;
+        env.db().exec(QStringLiteral("INSERT INTO CONTACT (LID, NAME, CONTBEZ) VALUES (1, 'Bäcker', 'Bäcker, \"Brot\" & Co')"));
+        env.db().exec(QStringLiteral("INSERT INTO CONTACT (LID, NAME, CONTBEZ) VALUES (2, 'Zorn', 'Zorn')"));
+        std::vector<MainWindowFeature> f = defaultMainWindowFeatures();
+        f.push_back(test::plainWindows());
+        TLogform& w = env.window({}, f);
+        w.show();
+        w.findChild<QAction*>(QStringLiteral("dxBB_Ansicht_Kontakte"))->trigger();
+        auto* frame = qobject_cast<Tcontactlistframe*>(w.contactFrame());
+        QVERIFY(frame && frame->isConnected());
+        // What the grid shows is what is written: here only the contacts under "B".
+        frame->SetNewFilter(2);
+
+        bool walked = false;
+        QTimer::singleShot(0, &w, [&] {
+            auto* form = qobject_cast<TExportGridForm*>(QApplication::activeModalWidget());
+            QVERIFY(form);
+            form->setStartDelay(0);
+            form->findChild<QPushButton*>(QStringLiteral("RzButton2"))->click();
+            QLineEdit* name = form->findChild<QLineEdit*>(QStringLiteral("E1"));
+            name->clear();
+            QTest::keyClicks(name, QStringLiteral("Kontakte"));
+            auto* tree = form->findChild<QTreeView*>(QStringLiteral("cxSTV1"));
+            tree->setCurrentIndex(qobject_cast<QFileSystemModel*>(tree->model())->index(env.folder()));
+            form->findChild<QPushButton*>(QStringLiteral("RzButton2"))->click();
+            QTRY_COMPARE(form->currentPage(), TExportGridForm::PageResult);
+            walked = true;
+            form->findChild<QPushButton*>(QStringLiteral("RzButton2"))->click();
+        });
+        w.updateActions();
+        QAction* action = w.findChild<QAction*>(QStringLiteral("_LogFo_ContExport"));
+        QVERIFY(action->isEnabled());
+        action->trigger();
+        QVERIFY(walked);
+
+        const QString html = QString::fromUtf8(env.readFile(QStringLiteral("Kontakte.html")));
+        QVERIFY(html.contains(QStringLiteral("Bäcker, &quot;Brot&quot; &amp; Co")));
+        QVERIFY(!html.contains(QStringLiteral("Zorn")));
     }
 };
 
