@@ -13,11 +13,57 @@
 #include "platform/Registry.h"
 
 #include <QDir>
+#include <QFile>
+#include <QStringList>
 #include <QString>
 
+#include <cstdio>
 #include <cstring>
+#include <optional>
 
 namespace orvanta::bench {
+
+// The resident memory of this process in KiB; -1 when unknown.
+inline qint64 residentKiB()
+{
+    QFile f(QStringLiteral("/proc/self/status"));
+    if (!f.open(QIODevice::ReadOnly))
+        return -1;
+    for (const QByteArray& line : f.readAll().split('\n')) {
+        if (line.startsWith("VmRSS:"))
+            return line.mid(6).trimmed().split(' ').first().toLongLong();
+    }
+    return -1;
+}
+
+// "--max N --dir FOLDER": the largest log size and where the run's databases go. Bad
+// arguments print the usage and give nothing.
+struct RunOptions {
+    qint64 maxCalls = 1'000'000;
+    QString folder;
+};
+
+inline std::optional<RunOptions> runOptions(const QStringList& args, const char* program)
+{
+    RunOptions o;
+    for (qsizetype i = 1; i < args.size(); ++i) {
+        if (args[i] == QLatin1String("--max") && i + 1 < args.size()) {
+            bool ok = false;
+            o.maxCalls = args[++i].toLongLong(&ok);
+            if (!ok || o.maxCalls < 1)
+                o.maxCalls = 0;
+        } else if (args[i] == QLatin1String("--dir") && i + 1 < args.size()) {
+            o.folder = args[++i];
+        } else {
+            o.maxCalls = 0;
+        }
+        if (o.maxCalls == 0) {
+            std::fprintf(stderr, "usage: %s [--max N] [--dir FOLDER]\n", program);
+            return std::nullopt;
+        }
+    }
+    return o;
+}
 
 // The name pattern of the run's temporary folder, under 'folder' or the system's.
 inline QString tempFolderPattern(const QString& folder, const char* program)

@@ -24,48 +24,16 @@
 using namespace orvanta;
 using namespace orvanta::bench;
 
-namespace {
-
-qint64 residentKiB()
-{
-    QFile f(QStringLiteral("/proc/self/status"));
-    if (!f.open(QIODevice::ReadOnly))
-        return -1;
-    for (const QByteArray& line : f.readAll().split('\n')) {
-        if (line.startsWith("VmRSS:"))
-            return line.mid(6).trimmed().split(' ').first().toLongLong();
-    }
-    return -1;
-}
-
-int usage()
-{
-    std::fprintf(stderr, "usage: bench_export [--max N] [--dir FOLDER]\n");
-    return 2;
-}
-
-} // namespace
-
 int main(int argc, char* argv[])
 {
     if (qEnvironmentVariableIsEmpty("QT_QPA_PLATFORM"))
         qputenv("QT_QPA_PLATFORM", "offscreen");
     QApplication app(argc, argv);
-    qint64 maxCalls = 1'000'000;
-    QString folder;
-    const QStringList args = app.arguments();
-    for (qsizetype i = 1; i < args.size(); ++i) {
-        if (args[i] == QLatin1String("--max") && i + 1 < args.size()) {
-            bool ok = false;
-            maxCalls = args[++i].toLongLong(&ok);
-            if (!ok || maxCalls < 1)
-                return usage();
-        } else if (args[i] == QLatin1String("--dir") && i + 1 < args.size()) {
-            folder = args[++i];
-        } else {
-            return usage();
-        }
-    }
+    const std::optional<RunOptions> options = runOptions(app.arguments(), "bench_export");
+    if (!options)
+        return 2;
+    const qint64 maxCalls = options->maxCalls;
+    const QString folder = options->folder;
     QTemporaryDir temp(tempFolderPattern(folder, "bench_export"));
     if (!temp.isValid()) {
         std::fprintf(stderr, "no temporary folder\n");
