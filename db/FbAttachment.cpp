@@ -196,6 +196,14 @@ void FbAttachment::createDatabase(const QString& databaseName, const QString& us
     provider->release();
 }
 
+QString FbAttachment::clientVersion()
+{
+    // The legacy call gives the full build number; the object API only major and minor.
+    char text[256] = {};
+    isc_get_client_version(text);
+    return QString::fromLatin1(text);
+}
+
 void FbAttachment::dropDatabase()
 {
     IAttachment* att = d->require();

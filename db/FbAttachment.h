@@ -46,6 +46,8 @@ public:
     // Without forced writes the engine does not sync every page write (scratch databases only).
     static void createDatabase(const QString& databaseName, const QString& user, const QString& password,
                                int pageSize = 8192, bool forcedWrites = true);
+    // The client library's version text, e.g. "LI-V3.0.11.33703 Firebird 3.0".
+    [[nodiscard]] static QString clientVersion();
     // Deletes the connected database file (tests, tools).
     void dropDatabase();
 
