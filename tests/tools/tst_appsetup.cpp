@@ -217,6 +217,22 @@ private Q_SLOTS:
         QVERIFY(read.INCOMING_MSN_ONLY());
     }
 
+    void aCountryItDoesNotOfferIsKept()
+    {
+        ProgramTestEnv e(QDateTime(QDate(2024, 5, 15), QTime(12, 0)), ProgramTestEnv::ErrorLogSetup::None);
+        // Without "AC" the monitor settings read 0, which the country box does not offer.
+        const QByteArray isdnStore = "[MoniOptions]\r\nDBL=4\r\n";
+        QVERIFY(e.writeFile(QStringLiteral("ISDNStore"), isdnStore));
+        AppSetupDialog dialog;
+        QCOMPARE(child<QComboBox>(dialog, "cbCountry")->currentIndex(), -1);
+        setMsns(dialog, {{QStringLiteral("301"), QStringLiteral("Büro")}});
+        QVERIFY(dialog.apply());
+        QCOMPARE(e.readFile(QStringLiteral("ISDNStore")), isdnStore);
+        child<QComboBox>(dialog, "cbCountry")->setCurrentIndex(0);
+        QVERIFY(dialog.apply());
+        QCOMPARE(e.readFile(QStringLiteral("ISDNStore")), QByteArray("[MoniOptions]\r\nDBL=4\r\nAC=1\r\n"));
+    }
+
     void msnsAndAutostartAreWhatTheMonitorReads()
     {
         ProgramTestEnv e(QDateTime(QDate(2024, 5, 15), QTime(12, 0)), ProgramTestEnv::ErrorLogSetup::None);

@@ -48,6 +48,7 @@ AboutDialog::AboutDialog(QWidget* parent)
     bp.setColor(QPalette::WindowText, Qt::white);
     band->setPalette(bp);
     band->setAutoFillBackground(true);
+    band->setSizePolicy(QSizePolicy::Preferred, QSizePolicy::Fixed);
     auto* bandLayout = new QVBoxLayout(band);
     bandLayout->setContentsMargins(16, 12, 16, 12);
     QLabel* name = value(band, "lblProgram", QStringLiteral("Varnik Orvanta"));
@@ -84,6 +85,7 @@ AboutDialog::AboutDialog(QWidget* parent)
     layout->addLayout(buttons);
     connect(ok, &QPushButton::clicked, this, &QDialog::accept);
     setMinimumWidth(480);
+    adjustSize();
 }
 
 AboutDialog::~AboutDialog() = default;

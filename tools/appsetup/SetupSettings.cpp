@@ -127,8 +127,6 @@ QString SetupSettings::validate(const SetupValues& values)
 {
     if (const QString problem = validateConnection(values.connection); !problem.isEmpty())
         return problem;
-    if (values.country < 1 || values.country > 3)
-        return QStringLiteral("Bitte wählen Sie das Land der Vorwahlen.");
     QSet<QString> seen;
     for (const MsnRecord& msn : values.msns) {
         if (msn.MSN.isEmpty())
@@ -151,6 +149,9 @@ QString SetupSettings::save(const SetupValues& values)
 {
     if (const QString problem = validate(values); !problem.isEmpty())
         return problem;
+    // A value the monitor wrote that this program does not offer stays until one is chosen.
+    if (values.country != m_loaded.country && (values.country < 1 || values.country > 3))
+        return QStringLiteral("Bitte wählen Sie das Land der Vorwahlen.");
 
     if (values.connection != m_loaded.connection) {
         if (!values.connection.write())
