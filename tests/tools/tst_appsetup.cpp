@@ -141,6 +141,8 @@ private Q_SLOTS:
 
         click(dialog, "btnOK");
         QCOMPARE(dialog.result(), int(QDialog::Accepted));
+        QCOMPARE(e.dialogs().last().text,
+                 QStringLiteral("Die neue Datenbankverbindung gilt ab dem nächsten Start von Orvanta und der Rufwarte."));
         QCOMPARE(storedValue(QStringLiteral("Database")), e.db().path());
         QVERIFY(storedValue(QStringLiteral("Password")) != QStringLiteral("masterkey"));
         QCOMPARE(CredentialCipher::decrypt(storedValue(QStringLiteral("Username"))), QStringLiteral("SYSDBA"));

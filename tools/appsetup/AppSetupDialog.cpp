@@ -309,12 +309,17 @@ bool AppSetupDialog::testConnection()
 
 bool AppSetupDialog::apply()
 {
+    const StoredConnection before = m_settings.loaded().connection;
     const QString problem = m_settings.save(values());
     updateStates();
     if (!problem.isEmpty()) {
         dialogs().error(QStringLiteral("Die Einstellungen konnten nicht gespeichert werden.\n\n") + problem);
         return false;
     }
+    // The program and the monitor connect once, at their start.
+    if (m_settings.loaded().connection != before)
+        dialogs().information(QStringLiteral("Die neue Datenbankverbindung gilt ab dem nächsten Start von Orvanta "
+                                             "und der Rufwarte."));
     return true;
 }
 
