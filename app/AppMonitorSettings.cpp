@@ -2,7 +2,7 @@
 
 #include "app/AppServices.h"
 
-#include "app/RufwarteIni.h"
+#include "platform/RufwarteIni.h"
 #include "platform/ProgramFolder.h"
 
 #include <memory>

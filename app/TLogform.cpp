@@ -272,11 +272,7 @@ void TLogform::FormCreate(const QStringList& parameters)
     m_calendar->setDate(Clock::today());
 
     // Colour scheme: "OScheme", section "AppColor", key "Value"; default 2, anything else is 2.
-    {
-        const IniFile scheme(programFile(QStringLiteral("OScheme")));
-        setAppColorScheme(scheme.readInteger(QStringLiteral("AppColor"), QStringLiteral("Value"), 2));
-        applyColorScheme(appColorScheme());
-    }
+    applyColorScheme(loadAppColorScheme());
 
     // The navigation panel last shown: 2 calendar, 3 contacts, anything else the log.
     try {

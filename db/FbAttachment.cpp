@@ -2,6 +2,8 @@
 
 #include "db/FbPrivate_p.h"
 
+#include <QRegularExpression>
+
 
 namespace orvanta {
 
@@ -194,6 +196,19 @@ void FbAttachment::createDatabase(const QString& databaseName, const QString& us
         });
     dpb->dispose();
     provider->release();
+}
+
+QString FbAttachment::clientVersion()
+{
+    // The object API knows major and minor; the legacy text ("LI-V6.3.11.33637 Firebird 3.0")
+    // adds patch level and build behind an InterBase-style version of its own.
+    char buffer[256] = {};
+    isc_get_client_version(buffer);
+    const QString text = QString::fromLatin1(buffer);
+    const unsigned version = fbapi::util()->getClientVersion();
+    const QString majorMinor = QStringLiteral("%1.%2").arg(version >> 8).arg(version & 0xFFu);
+    const QRegularExpressionMatch build = QRegularExpression(QStringLiteral("V\\d+\\.\\d+\\.(\\d+)\\.(\\d+)")).match(text);
+    return build.hasMatch() ? majorMinor + u'.' + build.captured(1) + u'.' + build.captured(2) : majorMinor;
 }
 
 void FbAttachment::dropDatabase()

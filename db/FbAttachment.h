@@ -46,6 +46,8 @@ public:
     // Without forced writes the engine does not sync every page write (scratch databases only).
     static void createDatabase(const QString& databaseName, const QString& user, const QString& password,
                                int pageSize = 8192, bool forcedWrites = true);
+    // The client library's version: "3.0.11.33637" (major, minor, patch level, build).
+    [[nodiscard]] static QString clientVersion();
     // Deletes the connected database file (tests, tools).
     void dropDatabase();
 

@@ -1,10 +1,9 @@
 #include "db/TDM2.h"
 
-#include "db/CredentialCipher.h"
 #include "db/DatabaseError.h"
+#include "db/StoredConnection.h"
 #include "db/TDM2Statements.h"
 #include "platform/ErrorLog.h"
-#include "platform/Registry.h"
 
 namespace orvanta {
 
@@ -119,21 +118,10 @@ TDM2::~TDM2()
 bool TDM2::GetDBData(FbAttachment& connection)
 {
     try {
-        QString password;
-        QString user;
-        QString database;
-        {
-            Registry registry(RegistryRoot::LocalMachine);
-            if (registry.openKeyReadOnly(QString::fromLatin1(kRegistryKey))) {
-                password = registry.readString(QStringLiteral("Password"));
-                user = registry.readString(QStringLiteral("Username"));
-                database = registry.readString(QStringLiteral("Database"));
-                registry.closeKey();
-            }
-        }
-        connection.setDatabaseName(database);
-        putFirst(connection.params(), QStringLiteral("password="), CredentialCipher::decrypt(password));
-        putFirst(connection.params(), QStringLiteral("user_name="), CredentialCipher::decrypt(user));
+        const StoredConnection stored = StoredConnection::read();
+        connection.setDatabaseName(stored.database);
+        putFirst(connection.params(), QStringLiteral("password="), stored.password);
+        putFirst(connection.params(), QStringLiteral("user_name="), stored.user);
         return true;
     } catch (const std::exception& e) {
         reportError(QStringLiteral("# DM2 - GetDBData"), &e);

@@ -8,6 +8,7 @@
 #include "db/FbAttachment.h"
 #include "db/FbStatement.h"
 #include "db/FbTransaction.h"
+#include "db/StoredConnection.h"
 
 #include <QObject>
 
@@ -31,7 +32,7 @@ public:
     bool DBConnect();
 
     // Registry key and values of the connection data.
-    static constexpr const char* kRegistryKey = "software\\Varnik\\rufwarte";
+    static constexpr const char* kRegistryKey = StoredConnection::kRegistryKey;
 
     FbAttachment IBDatabase1;
 

@@ -2,7 +2,7 @@
 // program reads them at start-up. Input: two bytes giving the MSN file's share, the MSN file,
 // then the settings file.
 
-#include "app/RufwarteIni.h"
+#include "platform/RufwarteIni.h"
 #include "platform/DialogService.h"
 
 #include <QDir>

@@ -60,9 +60,11 @@ void IniFile::parse(QByteArrayView bytes)
 {
     m_sections.clear();
     m_sectionIndex.clear();
+    m_prelude.clear();
 
     QString text;
-    if (bytes.startsWith("\xEF\xBB\xBF")) {
+    m_utf8Bom = bytes.startsWith("\xEF\xBB\xBF");
+    if (m_utf8Bom) {
         QStringDecoder utf8(QStringDecoder::Utf8);
         text = utf8(bytes.sliced(3));
     } else {
@@ -73,54 +75,81 @@ void IniFile::parse(QByteArrayView bytes)
 
     Section* current = nullptr;
     bool currentIsDuplicate = false;
+    // Lines that carry nothing readable wait here until it is known what they belong to.
+    QStringList pending;
+    const auto flushPending = [&] {
+        QStringList& target = current != nullptr ? current->tail : m_prelude;
+        target += pending;
+        pending.clear();
+    };
     qsizetype lineStart = 0;
     const qsizetype size = text.size();
-    while (lineStart <= size) {
+    while (lineStart < size) {
         qsizetype lineEnd = lineStart;
         while (lineEnd < size && text[lineEnd] != u'\n' && text[lineEnd] != u'\r')
             ++lineEnd;
-        QStringView line = trimBlanks(QStringView(text).mid(lineStart, lineEnd - lineStart));
+        const QString raw = text.mid(lineStart, lineEnd - lineStart);
         lineStart = lineEnd + 1;
+        if (lineEnd + 1 < size && text[lineEnd] == u'\r' && text[lineEnd + 1] == u'\n')
+            ++lineStart;
+        const QStringView line = trimBlanks(raw);
 
-        if (line.isEmpty() || line.front() == u';')
+        if (line.isEmpty() || line.front() == u';') {
+            pending.append(raw);
             continue;
+        }
         if (line.front() == u'[') {
             const qsizetype close = line.indexOf(u']');
             const QString name = trimBlanks(line.mid(1, close < 0 ? -1 : close - 1)).toString();
             const QString folded = fold(name);
             // Later duplicates of a section are invisible, as with the Windows profile functions.
             currentIsDuplicate = m_sectionIndex.contains(folded);
-            if (!currentIsDuplicate) {
-                m_sectionIndex.insert(folded, m_sections.size());
-                m_sections.push_back(Section{name, {}, {}});
-                current = &m_sections.back();
+            if (currentIsDuplicate) {
+                pending.append(raw);
+                continue;
             }
+            flushPending();
+            m_sectionIndex.insert(folded, m_sections.size());
+            m_sections.push_back(Section{name, raw, {}, {}, {}});
+            current = &m_sections.back();
             continue;
         }
-        if (current == nullptr || currentIsDuplicate)
-            continue;
         const qsizetype eq = line.indexOf(u'=');
-        if (eq <= 0)
+        const QString key = eq > 0 ? trimBlanks(line.left(eq)).toString() : QString();
+        if (current == nullptr || currentIsDuplicate || key.isEmpty() || findEntry(*current, key) != nullptr) {
+            pending.append(raw);
             continue;
-        const QString key = trimBlanks(line.left(eq)).toString();
-        if (key.isEmpty())
-            continue;
-        if (findEntry(*current, key) == nullptr)
-            addEntry(*current, key, trimBlanks(line.mid(eq + 1)).toString());
+        }
+        addEntry(*current, key, trimBlanks(line.mid(eq + 1)).toString());
+        Entry& entry = current->entries.back();
+        entry.lead = std::move(pending);
+        entry.line = raw;
+        pending.clear();
     }
+    flushPending();
 }
 
 QByteArray IniFile::serialize() const
 {
-    QString text;
+    QStringList lines = m_prelude;
     for (const Section& section : m_sections) {
-        if (!text.isEmpty())
-            text += QStringLiteral("\r\n");
-        text += u'[' + section.name + QStringLiteral("]\r\n");
-        for (const Entry& entry : section.entries)
-            text += entry.key + u'=' + entry.value + QStringLiteral("\r\n");
+        if (!section.header.isEmpty()) {
+            lines.append(section.header);
+        } else {
+            if (!lines.isEmpty() && !lines.constLast().isEmpty())
+                lines.append(QString());
+            lines.append(u'[' + section.name + u']');
+        }
+        for (const Entry& entry : section.entries) {
+            lines += entry.lead;
+            lines.append(entry.line.isEmpty() ? entry.key + u'=' + entry.value : entry.line);
+        }
+        lines += section.tail;
     }
-    return toWindows1252(text);
+    if (lines.isEmpty())
+        return {};
+    const QString text = lines.join(QStringLiteral("\r\n")) + QStringLiteral("\r\n");
+    return m_utf8Bom ? QByteArray("\xEF\xBB\xBF") + text.toUtf8() : toWindows1252(text);
 }
 
 bool IniFile::save() const
@@ -253,9 +282,15 @@ void IniFile::writeString(const QString& section, const QString& key, const QStr
         return;
     Section& target = sectionForWrite(section);
     const auto at = target.index.constFind(fold(cleanKey));
-    if (at != target.index.cend())
-        target.entries[*at].value = singleLine(value);
-    else
+    if (at != target.index.cend()) {
+        Entry& entry = target.entries[*at];
+        const QString clean = singleLine(value);
+        // An unchanged value keeps its line as it was written, blanks and all.
+        if (clean != entry.value) {
+            entry.value = clean;
+            entry.line.clear();
+        }
+    } else
         addEntry(target, cleanKey, singleLine(value));
 }
 
@@ -283,6 +318,12 @@ void IniFile::deleteKey(const QString& section, const QString& key)
     const auto at = target.index.constFind(fold(key));
     if (at == target.index.cend())
         return;
+    // Comments above the key stay with what follows it.
+    const QStringList lead = target.entries[*at].lead;
+    if (*at + 1 < target.entries.size())
+        target.entries[*at + 1].lead = lead + target.entries[*at + 1].lead;
+    else
+        target.tail = lead + target.tail;
     target.entries.erase(target.entries.begin() + static_cast<std::ptrdiff_t>(*at));
     target.index.clear();
     for (std::size_t i = 0; i < target.entries.size(); ++i)
@@ -304,6 +345,8 @@ void IniFile::clear()
 {
     m_sections.clear();
     m_sectionIndex.clear();
+    m_prelude.clear();
+    m_utf8Bom = false;
     m_loaded = false;
 }
 
@@ -326,7 +369,7 @@ IniFile::Section& IniFile::sectionForWrite(const QString& name)
     if (at != m_sectionIndex.cend())
         return m_sections[*at];
     m_sectionIndex.insert(folded, m_sections.size());
-    m_sections.push_back(Section{clean, {}, {}});
+    m_sections.push_back(Section{clean, {}, {}, {}, {}});
     return m_sections.back();
 }
 
@@ -339,7 +382,7 @@ const IniFile::Entry* IniFile::findEntry(const Section& section, const QString& 
 void IniFile::addEntry(Section& section, const QString& key, const QString& value)
 {
     section.index.insert(fold(key), section.entries.size());
-    section.entries.push_back(Entry{key, value});
+    section.entries.push_back(Entry{key, value, {}, {}});
 }
 
 } // namespace orvanta

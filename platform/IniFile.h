@@ -4,6 +4,9 @@
 // duplicate wins; values are raw text (no quotes or escapes) trimmed of surrounding blanks;
 // text is Windows-1252 (a UTF-8 byte-order mark is honoured); lines end in CR LF when written
 // and in LF, CR LF or CR when read. Junk lines and NUL bytes are skipped, never fatal.
+// Like WritePrivateProfileString, a loaded file keeps what the program does not touch: comments,
+// blank lines, junk, hidden duplicates and the exact text of every line whose value is not
+// changed are written back as they were read.
 
 #include <QHash>
 #include <QString>
@@ -59,9 +62,13 @@ private:
     struct Entry {
         QString key;
         QString value;
+        QStringList lead; // lines kept verbatim before this one (comments, blanks, junk)
+        QString line;     // the line as read; empty once the value is changed
     };
     struct Section {
         QString name;
+        QString header;   // the header line as read; empty for a new section
+        QStringList tail; // lines kept verbatim after the last entry
         std::vector<Entry> entries;
         QHash<QString, std::size_t> index; // folded key -> position in entries
     };
@@ -74,6 +81,8 @@ private:
 
     QString m_path;
     bool m_loaded = false;
+    bool m_utf8Bom = false;   // written back as it was read
+    QStringList m_prelude;    // lines before the first section
     std::vector<Section> m_sections;
     QHash<QString, std::size_t> m_sectionIndex; // folded name -> position in m_sections
 };

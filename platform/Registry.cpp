@@ -1,7 +1,9 @@
 #include "platform/Registry.h"
 
 #include <QDir>
+#include <QFile>
 #include <QFileInfo>
+#include <QSaveFile>
 #include <QStandardPaths>
 
 namespace orvanta {
@@ -114,6 +116,15 @@ bool Registry::deleteValue(const QString& name)
     return saveFile();
 }
 
+bool Registry::writeStrings(const QList<std::pair<QString, QString>>& values)
+{
+    if (!m_writable || m_currentKey.isEmpty())
+        return false;
+    for (const auto& [name, value] : values)
+        m_file.writeString(m_currentKey, name, value);
+    return saveFile();
+}
+
 bool Registry::saveFile()
 {
     const QString path = filePath(m_root);
@@ -122,12 +133,44 @@ bool Registry::saveFile()
     return m_file.save();
 }
 
-bool autostartEntryExists(const QString& applicationName)
+QString autostartEntryPath(const QString& applicationName)
 {
     const QString name = applicationName.section(u'.', 0, 0);
     if (name.isEmpty())
+        return {};
+    return configHome() + QStringLiteral("/autostart/") + name + QStringLiteral(".desktop");
+}
+
+bool autostartEntryExists(const QString& applicationName)
+{
+    const QString path = autostartEntryPath(applicationName);
+    return !path.isEmpty() && QFileInfo::exists(path);
+}
+
+bool setAutostartEntry(const QString& applicationName, bool enabled, const QString& displayName,
+                       const QString& commandLine)
+{
+    const QString path = autostartEntryPath(applicationName);
+    if (path.isEmpty())
         return false;
-    return QFileInfo::exists(configHome() + QStringLiteral("/autostart/") + name + QStringLiteral(".desktop"));
+    if (!enabled)
+        return !QFileInfo::exists(path) || QFile::remove(path);
+    if (QFileInfo::exists(path))
+        return true;
+    if (!QDir().mkpath(QFileInfo(path).absolutePath()))
+        return false;
+    // The desktop entry format is UTF-8 with LF, unlike the program's own settings files; its
+    // string values take a backslash doubled before the Exec line's own quoting sees it.
+    QString exec = commandLine;
+    exec.replace(u'\\', QStringLiteral("\\\\"));
+    const QByteArray entry = QStringLiteral("[Desktop Entry]\nType=Application\nName=%1\nExec=%2\n"
+                                            "X-GNOME-Autostart-enabled=true\n")
+                                 .arg(displayName, exec)
+                                 .toUtf8();
+    QSaveFile file(path);
+    if (!file.open(QIODevice::WriteOnly) || file.write(entry) != entry.size())
+        return false;
+    return file.commit();
 }
 
 } // namespace orvanta

@@ -7,7 +7,10 @@
 
 #include "platform/IniFile.h"
 
+#include <QList>
 #include <QString>
+
+#include <utility>
 
 namespace orvanta {
 
@@ -34,6 +37,8 @@ public:
     // Writes and saves at once; false when no key is open for writing or the file cannot be written.
     bool writeString(const QString& name, const QString& value);
     bool deleteValue(const QString& name);
+    // Writes several values with one save, so that they change together or not at all.
+    bool writeStrings(const QList<std::pair<QString, QString>>& values);
 
     // "Software\Varnik\rufwarte\" and "software/varnik/Rufwarte" name the same key.
     [[nodiscard]] static QString normalizeKeyPath(const QString& keyPath);
@@ -52,5 +57,11 @@ private:
 // $XDG_CONFIG_HOME/autostart/<name>.desktop exists, where <name> is applicationName without
 // everything from its first "." ("rufwarte.exe" -> "rufwarte.desktop"). Empty name: false.
 [[nodiscard]] bool autostartEntryExists(const QString& applicationName);
+[[nodiscard]] QString autostartEntryPath(const QString& applicationName);
+// Creates (atomically) or removes that entry. Enabling keeps an entry that exists as it is, so
+// what the user or the desktop added to it survives; a new one runs commandLine (the Exec line
+// of the desktop entry format). False when the file cannot be written or removed.
+[[nodiscard]] bool setAutostartEntry(const QString& applicationName, bool enabled, const QString& displayName,
+                                     const QString& commandLine);
 
 } // namespace orvanta

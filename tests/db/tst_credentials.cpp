@@ -1,8 +1,11 @@
 #include "db/B64Decoder.h"
 #include "db/CredentialCipher.h"
+#include "db/StoredConnection.h"
 #include "platform/ConvertError.h"
 #include "tests/support/TestRegistry.h"
 
+#include <QFile>
+#include <QTemporaryDir>
 #include <QTest>
 
 using namespace orvanta;
@@ -75,6 +78,26 @@ private Q_SLOTS:
     void undecodableStoredValueRaises()
     {
         QVERIFY_THROWS_EXCEPTION(ConvertError, (void)CredentialCipher::decrypt(QStringLiteral("VDhaMFZIdzBBY1VmX")));
+    }
+
+    void storedConnectionRoundTripsThroughTheRegistry()
+    {
+        QTemporaryDir dir;
+        qputenv("VARNIK_HKLM", QFile::encodeName(dir.filePath(QStringLiteral("hklm.ini"))));
+        QCOMPARE(StoredConnection::read(), StoredConnection{});
+        const StoredConnection written{QStringLiteral("srv:/data/orvanta.fdb"), QString::fromUtf8("Jürgen"),
+                                       QString::fromUtf8("Geheim € 1")};
+        QVERIFY(written.write());
+        QCOMPARE(StoredConnection::read(), written);
+        QCOMPARE(StoredConnection::readDatabaseName(), written.database);
+
+        // The file holds only the encrypted forms, as the monitor writes them.
+        QFile f(dir.filePath(QStringLiteral("hklm.ini")));
+        QVERIFY(f.open(QIODevice::ReadOnly));
+        const QByteArray bytes = f.readAll();
+        QVERIFY(bytes.contains("Username=" + CredentialCipher::encrypt(written.user).toLatin1() + "\r\n"));
+        QVERIFY(!bytes.contains("Geheim"));
+        qunsetenv("VARNIK_HKLM");
     }
 };
 

@@ -152,6 +152,41 @@ private Q_SLOTS:
         QCOMPARE(toWindows1252(text), all);
         QCOMPARE(toWindows1252(QString::fromUtf8("a\u0100\U0001F600b")), QByteArray("a??b"));
     }
+
+    void editingKeepsWhatItDoesNotTouch()
+    {
+        const QByteArray original = "; Kopf\r\n\r\n[A]\r\n x = 1 \r\n; \xFC" "ber y\r\ny=2\r\nx=doppelt\r\nohne Gleich\r\n\r\n"
+                                    "[B]\r\nk=v\r\n[a]\r\nz=versteckt\r\n";
+        IniFile ini;
+        ini.parse(original);
+        QCOMPARE(ini.serialize(), original);
+        QCOMPARE(ini.readString(QStringLiteral("A"), QStringLiteral("x")), QStringLiteral("1"));
+        QCOMPARE(ini.readString(QStringLiteral("A"), QStringLiteral("z")), QString());
+
+        // An unchanged value keeps its line; a changed one is written anew; a new key follows
+        // the section's last key.
+        ini.writeString(QStringLiteral("a"), QStringLiteral("X"), QStringLiteral("1"));
+        ini.writeInteger(QStringLiteral("A"), QStringLiteral("y"), 3);
+        ini.writeString(QStringLiteral("A"), QStringLiteral("neu"), QStringLiteral("n"));
+        ini.writeString(QStringLiteral("C"), QStringLiteral("c"), QStringLiteral("1"));
+        QCOMPARE(ini.serialize(), QByteArray("; Kopf\r\n\r\n[A]\r\n x = 1 \r\n; \xFC" "ber y\r\ny=3\r\nneu=n\r\nx=doppelt\r\n"
+                                             "ohne Gleich\r\n\r\n[B]\r\nk=v\r\n[a]\r\nz=versteckt\r\n\r\n[C]\r\nc=1\r\n"));
+
+        // A deleted key's comment stays with what follows.
+        ini.deleteKey(QStringLiteral("A"), QStringLiteral("y"));
+        QVERIFY(ini.serialize().contains("; \xFC" "ber y\r\nneu=n\r\n"));
+        ini.deleteKey(QStringLiteral("A"), QStringLiteral("neu"));
+        QVERIFY(ini.serialize().startsWith("; Kopf\r\n\r\n[A]\r\n x = 1 \r\n; \xFC" "ber y\r\nx=doppelt\r\n"));
+    }
+
+    void utf8FilesStayUtf8()
+    {
+        IniFile ini;
+        ini.parse("\xEF\xBB\xBF[S]\nk=\xC3\xA4\n");
+        QCOMPARE(ini.readString(QStringLiteral("S"), QStringLiteral("k")), QString::fromUtf8("ä"));
+        ini.writeString(QStringLiteral("S"), QStringLiteral("n"), QString::fromUtf8("€"));
+        QCOMPARE(ini.serialize(), QByteArray("\xEF\xBB\xBF[S]\r\nk=\xC3\xA4\r\nn=\xE2\x82\xAC\r\n"));
+    }
 };
 
 ORVANTA_TEST(TestIniFile)

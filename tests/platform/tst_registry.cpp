@@ -1,6 +1,7 @@
 #include "platform/Registry.h"
 #include "tests/support/TestRegistry.h"
 
+#include <QFile>
 #include <QTemporaryDir>
 #include <QTest>
 
@@ -110,6 +111,40 @@ private Q_SLOTS:
         QVERIFY(autostartEntryExists(QStringLiteral("rufwarte")));
         QVERIFY(!autostartEntryExists(QString()));
         QVERIFY(!autostartEntryExists(QStringLiteral(".exe")));
+
+        // Enabling keeps an entry that exists as it is; disabling removes it.
+        QVERIFY(setAutostartEntry(QStringLiteral("rufwarte.exe"), true, QStringLiteral("Rufwarte"), QStringLiteral("x")));
+        QFile kept(autostartEntryPath(QStringLiteral("rufwarte.exe")));
+        QVERIFY(kept.open(QIODevice::ReadOnly));
+        QCOMPARE(kept.readAll(), QByteArray("[Desktop Entry]\n"));
+        kept.close();
+        QVERIFY(setAutostartEntry(QStringLiteral("rufwarte.exe"), false, {}, {}));
+        QVERIFY(!autostartEntryExists(QStringLiteral("rufwarte.exe")));
+        QVERIFY(setAutostartEntry(QStringLiteral("rufwarte.exe"), false, {}, {}));
+
+        QVERIFY(setAutostartEntry(QStringLiteral("rufwarte.exe"), true, QStringLiteral("Rufwarte"),
+                                  QStringLiteral("\"/opt/o/rufwarte\" run")));
+        QFile made(m_dir.filePath(QStringLiteral("config/autostart/rufwarte.desktop")));
+        QVERIFY(made.open(QIODevice::ReadOnly));
+        QCOMPARE(made.readAll(), QByteArray("[Desktop Entry]\nType=Application\nName=Rufwarte\nExec=\"/opt/o/rufwarte\" run\n"
+                                            "X-GNOME-Autostart-enabled=true\n"));
+        QVERIFY(!setAutostartEntry(QString(), true, {}, {}));
+    }
+
+    void severalValuesAreWrittenTogether()
+    {
+        QDir().mkpath(m_dir.filePath(QStringLiteral("hklm")));
+        writeFile(m_dir.filePath(QStringLiteral("hklm/registry.ini")),
+                  "; von Hand\r\n[software\\Varnik\\rufwarte]\r\nDatabase = /alt.fdb\r\nEigenes=1\r\n");
+        Registry r(RegistryRoot::LocalMachine);
+        QVERIFY(!r.writeStrings({{QStringLiteral("Database"), QStringLiteral("x")}}));
+        QVERIFY(r.openKey(QStringLiteral("Software/Varnik/Rufwarte"), false));
+        QVERIFY(r.writeStrings({{QStringLiteral("database"), QStringLiteral("/neu.fdb")},
+                                {QStringLiteral("Username"), QStringLiteral("U")}}));
+        QFile f(Registry::filePath(RegistryRoot::LocalMachine));
+        QVERIFY(f.open(QIODevice::ReadOnly));
+        QCOMPARE(f.readAll(), QByteArray("; von Hand\r\n[software\\Varnik\\rufwarte]\r\nDatabase=/neu.fdb\r\nEigenes=1\r\n"
+                                         "Username=U\r\n"));
     }
 };
 

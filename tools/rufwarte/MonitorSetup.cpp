@@ -1,13 +1,13 @@
 #include "tools/rufwarte/MonitorSetup.h"
 
-#include "db/CredentialCipher.h"
 #include "db/FbAttachment.h"
 #include "db/Schema.h"
 #include "db/SqlScript.h"
+#include "db/StoredConnection.h"
 #include "platform/AppException.h"
 #include "platform/IniFile.h"
 #include "platform/Registry.h"
-#include "platform/Windows1252.h"
+#include "platform/RufwarteIni.h"
 #include "tools/demo/DemoData.h"
 
 #include <QDir>
@@ -26,19 +26,6 @@ void writeIni(const QString& path, bool overwrite, const std::function<void(IniF
     ini.setPath(path);
     fill(ini);
     (void)ini.save();
-}
-
-// One 52-byte record of the MSN list: a short string of 20 and one of 30 characters.
-QByteArray msnRecord(const QString& number, const QString& label)
-{
-    QByteArray record(52, '\0');
-    const QByteArray n = toWindows1252(number).left(20);
-    const QByteArray l = toWindows1252(label).left(30);
-    record[0] = static_cast<char>(n.size());
-    std::copy(n.begin(), n.end(), record.begin() + 1);
-    record[21] = static_cast<char>(l.size());
-    std::copy(l.begin(), l.end(), record.begin() + 22);
-    return record;
 }
 
 const char* const kCalendarInfo =
@@ -70,10 +57,8 @@ void writeSettingsFiles(const QString& programFolder, bool overwrite)
     });
     const QString msns = f + QStringLiteral("msns");
     if (overwrite || !QFileInfo::exists(msns)) {
-        QFile file(msns);
-        if (file.open(QIODevice::WriteOnly))
-            file.write(msnRecord(QStringLiteral("3012345670"), QStringLiteral("Büro"))
-                       + msnRecord(QStringLiteral("3012345671"), QStringLiteral("Fax")));
+        (void)writeMsnFile(msns, {MsnRecord{QStringLiteral("3012345670"), QStringLiteral("Büro")},
+                                  MsnRecord{QStringLiteral("3012345671"), QStringLiteral("Fax")}});
     }
     const QString info = f + QStringLiteral("kalenderinfo.rtf");
     if (overwrite || !QFileInfo::exists(info)) {
@@ -85,12 +70,7 @@ void writeSettingsFiles(const QString& programFolder, bool overwrite)
 
 bool writeRegistry(const QString& database, const QString& user, const QString& password)
 {
-    Registry reg(RegistryRoot::LocalMachine);
-    if (!reg.openKey(QStringLiteral("software\\Varnik\\rufwarte"), true))
-        return false;
-    return reg.writeString(QStringLiteral("Database"), database)
-        && reg.writeString(QStringLiteral("Username"), CredentialCipher::encrypt(user))
-        && reg.writeString(QStringLiteral("Password"), CredentialCipher::encrypt(password));
+    return StoredConnection{database, user, password}.write();
 }
 
 QString setUp(const SetupOptions& o)

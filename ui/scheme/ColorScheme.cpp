@@ -1,5 +1,8 @@
 #include "ui/scheme/ColorScheme.h"
 
+#include "platform/IniFile.h"
+#include "platform/ProgramFolder.h"
+
 #include <array>
 
 namespace orvanta {
@@ -68,6 +71,13 @@ int appColorScheme()
 void setAppColorScheme(int value)
 {
     g_scheme = normalizedColorScheme(value);
+}
+
+int loadAppColorScheme()
+{
+    const IniFile scheme(programFile(QStringLiteral("OScheme")));
+    setAppColorScheme(scheme.readInteger(QStringLiteral("AppColor"), QStringLiteral("Value"), 2));
+    return appColorScheme();
 }
 
 MainWindowColors mainWindowColors(int scheme)

@@ -11,6 +11,9 @@ namespace orvanta {
 [[nodiscard]] int normalizedColorScheme(int value);
 [[nodiscard]] int appColorScheme();
 void setAppColorScheme(int value);
+// Sets the scheme from the program folder's "OScheme" (section "AppColor", key "Value"; a
+// missing file or value gives 2) and returns it. The program and its companion programs share it.
+int loadAppColorScheme();
 
 // A Windows colour reference: blue in the high byte of the three.
 [[nodiscard]] inline QColor colorFromBgr(unsigned bgr)

@@ -1,8 +1,10 @@
 #pragma once
 // The call monitor's settings as this program sees them: the "MoniOptions" section of the
-// monitor's settings file, its MSN list and whether the monitor starts with the session. Read
-// only: nothing here ever writes a file.
+// monitor's settings file, its MSN list and whether the monitor starts with the session. The
+// object only reads; the one writer of the MSN list file is writeMsnFile() below, used by the
+// monitor's own set-up and the settings program, never by the main program.
 
+#include <QByteArray>
 #include <QList>
 #include <QString>
 
@@ -17,6 +19,12 @@ struct MsnRecord {
 
     friend bool operator==(const MsnRecord&, const MsnRecord&) = default;
 };
+
+// The MSN list file for a list: one 52-byte record per number, the texts in Windows-1252 and cut
+// to 20 and 30 characters.
+[[nodiscard]] QByteArray encodeMsnFile(const QList<MsnRecord>& msns);
+// Writes the file atomically (the old list stays whole when writing fails). Returns success.
+[[nodiscard]] bool writeMsnFile(const QString& path, const QList<MsnRecord>& msns);
 
 class TRufwarteIni final {
 public:

@@ -1,4 +1,4 @@
-#include "app/RufwarteIni.h"
+#include "platform/RufwarteIni.h"
 
 #include "platform/AppException.h"
 #include "platform/DialogService.h"
@@ -10,6 +10,7 @@
 
 #include <QFile>
 #include <QFileInfo>
+#include <QSaveFile>
 
 #include <cmath>
 
@@ -56,7 +57,40 @@ QString shortString(const char* record, int capacity)
     return fromWindows1252(QByteArrayView(record + 1, length));
 }
 
+void putShortString(QByteArray& record, int at, const QString& text, int capacity)
+{
+    const QByteArray bytes = toWindows1252(text).left(capacity);
+    record[at] = static_cast<char>(bytes.size());
+    std::copy(bytes.begin(), bytes.end(), record.begin() + at + 1);
+}
+
 } // namespace
+
+QByteArray encodeMsnFile(const QList<MsnRecord>& msns)
+{
+    QByteArray bytes;
+    bytes.reserve(msns.size() * TRufwarteIni::kMsnRecordSize);
+    for (const MsnRecord& msn : msns) {
+        QByteArray record(TRufwarteIni::kMsnRecordSize, '\0');
+        putShortString(record, 0, msn.MSN, 20);
+        putShortString(record, 21, msn.Bezeichnung, 30);
+        bytes += record;
+    }
+    return bytes;
+}
+
+bool writeMsnFile(const QString& path, const QList<MsnRecord>& msns)
+{
+    QSaveFile file(path);
+    if (!file.open(QIODevice::WriteOnly))
+        return false;
+    const QByteArray bytes = encodeMsnFile(msns);
+    if (file.write(bytes) != bytes.size()) {
+        file.cancelWriting();
+        return false;
+    }
+    return file.commit();
+}
 
 void TRufwarteIni::SetFileNames(const QString& settingsFile, const QString& section, const QString& msnFileName,
     const QString& applicationName)

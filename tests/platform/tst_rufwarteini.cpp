@@ -1,4 +1,4 @@
-#include "app/RufwarteIni.h"
+#include "platform/RufwarteIni.h"
 #include "tests/support/ScriptedDialogService.h"
 #include "tests/support/TestRegistry.h"
 
@@ -251,6 +251,22 @@ private Q_SLOTS:
         QVERIFY(file.open(QIODevice::ReadOnly));
         QCOMPARE(file.readAll(), text);
         QVERIFY(!QFile::exists(path("msns")));
+    }
+
+    void writtenMsnFileReadsBack()
+    {
+        const QList<MsnRecord> msns{{QStringLiteral("3012345670"), QString::fromUtf8("Büro – Straße")},
+                                    {QStringLiteral("123456789012345678901"), QString(31, u'x')},
+                                    {QString(), QString()}};
+        QVERIFY(writeMsnFile(path("msns"), msns));
+        const QByteArray bytes = encodeMsnFile(msns);
+        QCOMPARE(bytes.size(), 3 * TRufwarteIni::kMsnRecordSize);
+        QCOMPARE(bytes.mid(21, 14), QByteArray("\x0D" "B\xFCro \x96 Stra\xDF" "e"));
+        auto ini = settings();
+        QCOMPARE(ini->MSNs(), (QList<MsnRecord>{msns[0], {QStringLiteral("12345678901234567890"), QString(30, u'x')}, {}}));
+        QVERIFY(writeMsnFile(path("msns"), {}));
+        ini->ReadMSNSFromFile();
+        QVERIFY(ini->MSNs().isEmpty());
     }
 };
 
