@@ -53,7 +53,8 @@ void TLogform::buildActions()
         [tellMonitor] { tellMonitor(MonitorLink::MonitorPauseResume); }, monitorRuns)
         ->setIcon(st->standardIcon(QStyle::SP_MediaPause));
     add("_LogFo_MoniSTART", QStringLiteral("Starten"),
-        [this] { m_launcher->start(QStringLiteral("rufwarte.exe"), {}, false); }, [this] { return m_monitorState == MonitorState::Absent; })
+        [this] { m_launcher->start(QStringLiteral("rufwarte.exe"), {}, false); },
+        [this] { return m_monitorState == MonitorState::Absent; })
         ->setIcon(st->standardIcon(QStyle::SP_MediaPlay));
     add("_LogFo_Setup", QStringLiteral("Einstellungen..."),
         [this] { m_launcher->start(QStringLiteral("AppSetup.exe"), {}, false); });
@@ -209,7 +210,8 @@ void TLogform::refreshMonitorState()
 {
     m_monitorState = m_monitor->monitorState();
     // Panel 1 is otherwise unused; a paused monitor logs no calls, which the user must see.
-    m_statusBar->setPanelText(1, m_monitorState == MonitorState::Paused ? QStringLiteral("Rufwarte angehalten") : QString());
+    m_statusBar->setPanelText(1, m_monitorState == MonitorState::Paused ? QStringLiteral("Rufwarte angehalten")
+                                                                        : QString());
     updateActions();
 }
 

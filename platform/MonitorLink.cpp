@@ -148,9 +148,9 @@ bool MonitorLink::handToRunningProgram(const QStringList& parameters, int timeou
 
 bool MonitorLink::sendLine(const QString& socketPath, int message, qint64 wParam, qint64 lParam, int timeoutMs)
 {
-    return writeLines(socketPath,
-                      QByteArray::number(message) + ' ' + QByteArray::number(wParam) + ' ' + QByteArray::number(lParam) + '\n',
-                      timeoutMs);
+    const QByteArray line =
+        QByteArray::number(message) + ' ' + QByteArray::number(wParam) + ' ' + QByteArray::number(lParam) + '\n';
+    return writeLines(socketPath, line, timeoutMs);
 }
 
 bool MonitorLink::writeLines(const QString& socketPath, const QByteArray& lines, int timeoutMs)

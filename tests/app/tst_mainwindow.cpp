@@ -89,7 +89,8 @@ private Q_SLOTS:
                 QVERIFY2(!more || !more->isVisible(), qPrintable(bar->objectName() + QLatin1Char(' ') + at));
                 for (QAction* a : bar->actions()) {
                     if (a->isVisible() && !a->isSeparator())
-                        QVERIFY2(bar->widgetForAction(a)->isVisible(), qPrintable(a->objectName() + QLatin1Char(' ') + at));
+                        QVERIFY2(bar->widgetForAction(a)->isVisible(),
+                                 qPrintable(a->objectName() + QLatin1Char(' ') + at));
                 }
             }
         }

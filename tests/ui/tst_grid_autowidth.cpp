@@ -203,7 +203,8 @@ private Q_SLOTS:
         const auto verifyStretching = [&f](bool abidAtMinimum) {
             const int rest = f.header()->width() - 40 - (abidAtMinimum ? 60 : 0);
             const int sum = abidAtMinimum ? 250 : 280;
-            for (const auto& [c, weight] : {std::pair{f.cols[1], 120}, std::pair{f.cols[3], 80}, std::pair{f.cols[4], 50}}) {
+            const std::pair<int, int> stretching[] = {{f.cols[1], 120}, {f.cols[3], 80}, {f.cols[4], 50}};
+            for (const auto& [c, weight] : stretching) {
                 const double expected = double(rest) * weight / sum;
                 QVERIFY2(std::abs(f.size(c) - expected) <= 1.0,
                          qPrintable(QStringLiteral("column %1: %2, expected %3").arg(c).arg(f.size(c)).arg(expected)));

@@ -114,7 +114,8 @@ int main(int argc, char* argv[])
     setProgramFolder(folder);
     // An installation is one folder: the monitor finds its registry key beside itself.
     const QString besideProgram = folder + QStringLiteral("registry.ini");
-    if (qEnvironmentVariableIsEmpty("VARNIK_HKLM") && (command == QLatin1String("setup") || QFileInfo::exists(besideProgram)))
+    if (qEnvironmentVariableIsEmpty("VARNIK_HKLM")
+        && (command == QLatin1String("setup") || QFileInfo::exists(besideProgram)))
         qputenv("VARNIK_HKLM", QFile::encodeName(besideProgram));
 
     if (command == QLatin1String("setup")) {
@@ -171,7 +172,8 @@ int main(int argc, char* argv[])
     }
     if (command == QLatin1String("quit") || command == QLatin1String("pause")) {
         const bool quit = command == QLatin1String("quit");
-        if (!MonitorLink::sendLine(MonitorLink::monitorSocketPath(), quit ? MonitorLink::MonitorQuit : MonitorLink::MonitorPauseResume, 0, 0)) {
+        const int message = quit ? MonitorLink::MonitorQuit : MonitorLink::MonitorPauseResume;
+        if (!MonitorLink::sendLine(MonitorLink::monitorSocketPath(), message, 0, 0)) {
             print(stderr, rufwarte::Monitor::isRunning() ? QStringLiteral("Die Rufwarte antwortet nicht.")
                                                          : QStringLiteral("Die Rufwarte läuft nicht."));
             return 1;

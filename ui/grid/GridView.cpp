@@ -222,7 +222,9 @@ std::vector<int> GridView::fittedWidths(const std::vector<int>& sections, int av
 {
     const int n = static_cast<int>(sections.size());
     std::vector<int> out(sections.size(), 0);
-    const auto stretches = [this](int c) { return c >= m_controller->columnCount() || m_controller->column(c).stretches; };
+    const auto stretches = [this](int c) {
+        return c >= m_controller->columnCount() || m_controller->column(c).stretches;
+    };
     const auto weight = [this](int c) {
         return c < m_controller->columnCount() ? m_controller->column(c).width : m_header->sectionSize(c);
     };
