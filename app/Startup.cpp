@@ -5,13 +5,16 @@
 #include "app/TLogform.h"
 #include "calllog/LogMaintenance.h"
 #include "db/TDM2.h"
+#include "platform/MonitorLink.h"
 #include "platform/NamedMutex.h"
 #include "platform/TerminationSignals.h"
 #include "ui/dialogs/MessageBoxDialogService.h"
 
 #include <QApplication>
+#include <QDeadlineTimer>
 #include <QDialog>
 #include <QPointer>
+#include <QThread>
 #include <QTimer>
 
 #include <functional>
@@ -29,12 +32,35 @@ bool Startup::mayStart(std::unique_ptr<NamedMutex>& instance)
     return true;
 }
 
+bool Startup::handToRunningInstance(const QStringList& parameters, int waitMs)
+{
+    // The first instance listens once its window is built; a start right behind it waits for that
+    // as long as the first still holds its mutex.
+    const QDeadlineTimer deadline(waitMs);
+    for (;;) {
+        if (MonitorLink::handToRunningProgram(parameters, 500))
+            return true;
+        if (deadline.hasExpired() || !NamedMutex::isHeld(QString::fromLatin1(InstanceMutexName)))
+            return false;
+        QThread::msleep(100);
+    }
+}
+
 int Startup::run(int argc, char* argv[])
 {
     (void)LogMaintenance::processLock();
     std::unique_ptr<NamedMutex> instance;
-    if (!mayStart(instance))
+    if (!mayStart(instance)) {
+        // A user who starts the program again wants to see it: the running one comes forward
+        // (with the "/co-" switch given here). Either way this start ends silently.
+        if (!NamedMutex::isHeld(QString::fromLatin1(BackupMutexName))) {
+            QCoreApplication handOver(argc, argv);
+            QStringList parameters = QCoreApplication::arguments();
+            parameters.removeFirst();
+            (void)handToRunningInstance(parameters, 3000);
+        }
         return 0;
+    }
 
     useSharedEmbeddedEngine();
     QApplication app(argc, argv);

@@ -20,6 +20,10 @@ public:
     // one instance. On true, instance holds the instance mutex until the end of the run.
     [[nodiscard]] static bool mayStart(std::unique_ptr<NamedMutex>& instance);
 
+    // A refused second start: asks the running instance to bring its window to the front and
+    // passes on a valid "/co-" switch. False when no instance took it within waitMs.
+    static bool handToRunningInstance(const QStringList& parameters, int waitMs);
+
     // The whole run; returns the exit code. A refused start ends at once and silently.
     static int run(int argc, char* argv[]);
 };

@@ -1,6 +1,7 @@
 #include "app/TLogform.h"
 
 #include "app/AppServices.h"
+#include "platform/ContactSwitch.h"
 #include "platform/MonitorLink.h"
 #include "app/ProgramLauncher.h"
 #include "calllog/LogMaintenance.h"
@@ -314,17 +315,16 @@ void TLogform::FormCreate(const QStringList& parameters)
 
 void TLogform::readCommandLine(const QStringList& parameters)
 {
-    if (parameters.size() != 1 || !parameters.first().startsWith(QStringLiteral("/co-")))
+    const ContactSwitch co = readContactSwitch(parameters);
+    if (!co.present)
         return;
-    bool ok = false;
-    const int id = parameters.first().mid(4).toInt(&ok, 10);
-    if (!ok) {
+    if (!co.valid) {
         const AppException e(QStringLiteral("'%1' ist kein gültiger Integerwert").arg(parameters.first().mid(4)));
         reportError(QStringLiteral("Übergabeparameter ist nicht korrekt!"), &e);
         m_startLogId = 0;
         return;
     }
-    m_startLogId = id;
+    m_startLogId = co.logId;
 }
 
 void TLogform::showEvent(QShowEvent* e)
@@ -421,6 +421,34 @@ void TLogform::restoreBars()
         for (QToolBar* tb : m_toolBars)
             tb->setVisible(true);
     }
+    wrapToolBars();
+}
+
+void TLogform::wrapToolBars()
+{
+    // The bars at the top fill a row as far as they fit and go on in the next, so that no button
+    // disappears behind a bar's "»" while the window has room for two rows.
+    const int available = width();
+    int used = 0;
+    for (QToolBar* tb : m_toolBars) {
+        if (toolBarArea(tb) != Qt::TopToolBarArea || tb->isHidden())
+            continue;
+        const int needed = tb->sizeHint().width() + 4; // the gap between two bars
+        const bool breakHere = used > 0 && used + needed > available;
+        if (breakHere != toolBarBreak(tb)) {
+            if (breakHere)
+                insertToolBarBreak(tb);
+            else
+                removeToolBarBreak(tb);
+        }
+        used = breakHere ? needed : used + needed;
+    }
+}
+
+void TLogform::resizeEvent(QResizeEvent* e)
+{
+    QMainWindow::resizeEvent(e);
+    wrapToolBars();
 }
 
 void TLogform::saveBars()

@@ -7,6 +7,7 @@
 #include "app/ActionRegistry.h"
 #include "app/WindowRegistries.h"
 #include "calllog/LogMaintenance.h"
+#include "platform/MonitorLink.h"
 #include "ui/frames/ContactListFrame.h"
 #include "ui/frames/LogListFrame.h"
 
@@ -32,7 +33,6 @@ namespace orvanta {
 
 class AdvNavBar;
 class AdvNavBarPanel;
-class MonitorLink;
 class PanelStatusBar;
 class PlannerCalendar;
 class ProgramLauncher;
@@ -118,7 +118,7 @@ public:
     void dispatchMessage(int message, qintptr wParam, qintptr lParam);
     // Brings every action's enabled state up to date (also runs on a timer).
     void updateActions();
-    // Re-reads whether the monitor's window exists (done once a second otherwise).
+    // Re-reads whether the monitor runs and whether it is paused (done once a second otherwise).
     void refreshMonitorState();
 
     [[nodiscard]] QAction* action(const QString& objectName) const;
@@ -134,6 +134,7 @@ protected:
     bool event(QEvent* e) override;
     void showEvent(QShowEvent* e) override;
     void closeEvent(QCloseEvent* e) override;
+    void resizeEvent(QResizeEvent* e) override;
 
 private:
     // creation
@@ -149,6 +150,7 @@ private:
     void readCommandLine(const QStringList& parameters);
     void restoreBars();
     void saveBars();
+    void wrapToolBars();
 
     // views
     void freeFrames();
@@ -218,7 +220,7 @@ private:
     bool m_grouping = false;
     bool m_shown = false;
     bool m_tornDown = false;
-    bool m_monitorExists = false;
+    MonitorState m_monitorState = MonitorState::Absent;
 };
 
 } // namespace orvanta

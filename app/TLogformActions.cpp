@@ -9,11 +9,13 @@
 #include "platform/ErrorLog.h"
 #include "ui/frames/ContactListFrame.h"
 #include "ui/frames/LogListFrame.h"
+#include "ui/statusbar/PanelStatusBar.h"
 
 #include <QAction>
 #include <QMenu>
 #include <QMenuBar>
 #include <QStyle>
+#include <QTimer>
 #include <QToolBar>
 
 namespace orvanta {
@@ -32,21 +34,27 @@ void TLogform::buildActions()
                             ActionRegistry::Rule enabled = {}) {
         return m_actions.add(QString::fromLatin1(name), caption, std::move(execute), std::move(enabled));
     };
-    const auto monitorRuns = [this] { return m_monitorExists; };
+    const auto monitorRuns = [this] { return m_monitorState != MonitorState::Absent; };
+    // The monitor answers at once; the buttons follow it without waiting for the next poll.
+    const auto tellMonitor = [this](int message) {
+        m_monitor->postToMonitor(message);
+        QTimer::singleShot(150, this, &TLogform::refreshMonitorState);
+    };
     const auto contactsReady = [this] { return contactFrameReady(); };
     const auto contactChosen = [this] { return contactSelected(); };
 
     add("_LogFo_Close", QStringLiteral("Beenden"), [this] { close(); });
     auto* closeApp = add("_LogFo_CloseApp", QStringLiteral("Beenden"),
-                         [this] { m_monitor->postToMonitor(MonitorLink::MonitorQuit); }, monitorRuns);
+                         [tellMonitor] { tellMonitor(MonitorLink::MonitorQuit); }, monitorRuns);
     closeApp->setToolTip(QStringLiteral("Rufwarte beenden"));
     closeApp->setStatusTip(QStringLiteral("Rufwarte beenden"));
     closeApp->setIcon(st->standardIcon(QStyle::SP_MediaStop));
     add("_LogFo_MoniSTOP", QStringLiteral("Anhalten/Fortsetzen"),
-        [this] { m_monitor->postToMonitor(MonitorLink::MonitorPauseResume); }, monitorRuns)
+        [tellMonitor] { tellMonitor(MonitorLink::MonitorPauseResume); }, monitorRuns)
         ->setIcon(st->standardIcon(QStyle::SP_MediaPause));
     add("_LogFo_MoniSTART", QStringLiteral("Starten"),
-        [this] { m_launcher->start(QStringLiteral("rufwarte.exe"), {}, false); }, [this] { return !m_monitorExists; })
+        [this] { m_launcher->start(QStringLiteral("rufwarte.exe"), {}, false); },
+        [this] { return m_monitorState == MonitorState::Absent; })
         ->setIcon(st->standardIcon(QStyle::SP_MediaPlay));
     add("_LogFo_Setup", QStringLiteral("Einstellungen..."),
         [this] { m_launcher->start(QStringLiteral("AppSetup.exe"), {}, false); });
@@ -200,7 +208,10 @@ bool TLogform::frameAllows(const QString& actionName) const
 
 void TLogform::refreshMonitorState()
 {
-    m_monitorExists = m_monitor->monitorWindowExists();
+    m_monitorState = m_monitor->monitorState();
+    // Panel 1 is otherwise unused; a paused monitor logs no calls, which the user must see.
+    m_statusBar->setPanelText(1, m_monitorState == MonitorState::Paused ? QStringLiteral("Rufwarte angehalten")
+                                                                        : QString());
     updateActions();
 }
 

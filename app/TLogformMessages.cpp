@@ -26,8 +26,11 @@ constexpr const char* kExisting = "existingContact"; // edits a stored contact
 constexpr const char* kCallerNumber = "callerNumber";
 constexpr const char* kSaveFailed = "saveFailed";
 
+// Out of the task bar (when minimised) and on top.
 void bringToFront(QWidget* w)
 {
+    if (w->isMinimized())
+        w->setWindowState((w->windowState() & ~Qt::WindowMinimized) | Qt::WindowActive);
     w->show();
     w->raise();
     w->activateWindow();
@@ -91,6 +94,7 @@ void TLogform::dispatchMessage(int message, qintptr wParam, qintptr lParam)
     case WMLOGOPENBEMERKUNG: runIfEnabled(QStringLiteral("_LogFo_OpenLogBemerkung")); break;
     case WMCLOSELOGDETAILFORM: WMCLOSELOGDETAILFORM_(wParam); break;
     case WMDELETELOGITEM: runIfEnabled(QStringLiteral("_LogFo_DelLog")); break;
+    case WMBRINGTOFRONT: bringToFront(this); break;
     default: break; // WMEXPORTGAUGE, WMSEARCHUNCHECKED, WMOPENCONTACTPERLOG, voice box: no effect
     }
     updateActions();

@@ -232,8 +232,21 @@ void Tlogframe::buildColumns()
     lid.sortable = lid.groupable = lid.movable = false;
     lid.showInColumnMenu = false;
     m_view->addColumn(lid);
-    m_view->addColumn(add("TSDATE", QStringLiteral("Datum"), 1, 70, true));
-    m_view->addColumn(add("TSTIME", QStringLiteral("Zeit"), 2, 51, true));
+    // Dates, times, the direction and the called line are never cut and never widen; the free
+    // space goes to the caller, the status and the remark. A stored layout keeps its own widths,
+    // within these minimums.
+    const auto fixedToContent = [this](GridColumn& c, const QStringList& samples, bool image = false,
+                                       bool sorted = false) {
+        c.minWidth = m_view->contentWidth(samples, c.caption, image, sorted);
+        c.width = c.minWidth;
+        c.stretches = false;
+    };
+    GridColumn tsdate = add("TSDATE", QStringLiteral("Datum"), 1, 70, true);
+    fixedToContent(tsdate, {QStringLiteral("00.00.0000")}, false, true); // sorted by default
+    m_view->addColumn(tsdate);
+    GridColumn tstime = add("TSTIME", QStringLiteral("Zeit"), 2, 51, true);
+    fixedToContent(tstime, {QStringLiteral("00:00:00")}, false, true);
+    m_view->addColumn(tstime);
     GridColumn ts = add("TS", {}, 0, 40, false);
     ts.showInColumnMenu = false;
     m_view->addColumn(ts);
@@ -253,6 +266,7 @@ void Tlogframe::buildColumns()
             return -1;
         return v == 0 ? 0 : v == 1 ? 1 : -1;
     };
+    fixedToContent(ctype, {QStringLiteral("Eingang"), QStringLiteral("Ausgang"), QStringLiteral("Unbekannt")}, true);
     m_view->addColumn(ctype);
 
     GridColumn service = add("SERVICE", QStringLiteral("ISDN-Service"), 6, 62, false);
@@ -282,20 +296,28 @@ void Tlogframe::buildColumns()
         }
         return kUnbekannt;
     };
-    GridColumn frombez = add("FROMBEZ", QStringLiteral("Anrufer"), 3, 153, true);
+    GridColumn frombez = add("FROMBEZ", QStringLiteral("Anrufer"), 3, 160, true);
+    frombez.minWidth = m_view->contentWidth({QStringLiteral("Unbekannt")}, frombez.caption);
     frombez.sortText = [fx, nameOrNumber](const GridSource& s, quint32 row) {
         return nameOrNumber(fx->frombez, fx->fromphone, s, row);
     };
     m_view->addColumn(frombez);
     m_view->addColumn(add("FROMSUBB", {}, 0, 0, false));
     m_view->addColumn(add("ONMSN", QStringLiteral("Zielnummer"), 0, 0, false));
-    m_view->addColumn(add("REGION", QStringLiteral("Region"), 12, 153, true));
+    // The region takes a small share: a long place name is cut before the caller's name is.
+    GridColumn region = add("REGION", QStringLiteral("Region"), 12, 60, true);
+    region.minWidth = m_view->contentWidth({QStringLiteral("Düsseldorf")}, region.caption);
+    m_view->addColumn(region);
     GridColumn onbez = add("ONBEZ", QStringLiteral("An"), 4, 58, true);
+    fixedToContent(onbez, {QStringLiteral("Privat")});
     onbez.sortText = [fx, nameOrNumber](const GridSource& s, quint32 row) {
         return nameOrNumber(fx->onbez, fx->onmsn, s, row);
     };
     m_view->addColumn(onbez);
-    m_view->addColumn(add("STATUS", QStringLiteral("Status"), 5, 78, true));
+    GridColumn status = add("STATUS", QStringLiteral("Status"), 5, 90, true);
+    status.minWidth = m_view->contentWidth({QStringLiteral("Nicht angenommen"), QStringLiteral("Anrufbeantworter")},
+                                           status.caption);
+    m_view->addColumn(status);
     GridColumn cid = add("CID", {}, 0, 0, false);
     cid.showInColumnMenu = false;
     m_view->addColumn(cid);
@@ -307,7 +329,8 @@ void Tlogframe::buildColumns()
     ccharge.numberFormat = QStringLiteral("0.00 €");
     ccharge.alignment = Qt::AlignRight | Qt::AlignVCenter;
     m_view->addColumn(ccharge);
-    GridColumn bemerk = add("BEMERK", QStringLiteral("Bemerkung"), 7, 95, true);
+    GridColumn bemerk = add("BEMERK", QStringLiteral("Bemerkung"), 7, 120, true);
+    bemerk.minWidth = m_view->contentWidth({}, bemerk.caption);
     bemerk.groupable = false;
     m_view->addColumn(bemerk);
     GridColumn abid = add("ABID", {}, 11, 30, true);

@@ -1,7 +1,7 @@
 #include "platform/MonitorLink.h"
 
+#include "platform/ContactSwitch.h"
 #include "platform/RuntimeFolder.h"
-
 #include "platform/WindowMessages.h"
 
 #include <QDir>
@@ -129,12 +129,31 @@ bool MonitorLink::filterMessage(QObject* target, int message, qint64 wParam, qin
     case MonitorContactFromCall:
         postMessage(target, WMCONTACTDATAFROMSCREEN, wParam, 0);
         return true;
+    case WMBRINGTOFRONT:
+        postMessage(target, WMBRINGTOFRONT, 0, 0);
+        return true;
     default:
         return false;
     }
 }
 
+bool MonitorLink::handToRunningProgram(const QStringList& parameters, int timeoutMs)
+{
+    QByteArray lines = QByteArray::number(WMBRINGTOFRONT) + " 0 0\n";
+    // A bad value is the first instance's to report at its own start, not a second one's.
+    if (const ContactSwitch co = readContactSwitch(parameters); co.valid && co.logId > 0)
+        lines += QByteArray::number(MonitorContactFromCall) + ' ' + QByteArray::number(co.logId) + " 0\n";
+    return writeLines(programSocketPath(), lines, timeoutMs);
+}
+
 bool MonitorLink::sendLine(const QString& socketPath, int message, qint64 wParam, qint64 lParam, int timeoutMs)
+{
+    const QByteArray line =
+        QByteArray::number(message) + ' ' + QByteArray::number(wParam) + ' ' + QByteArray::number(lParam) + '\n';
+    return writeLines(socketPath, line, timeoutMs);
+}
+
+bool MonitorLink::writeLines(const QString& socketPath, const QByteArray& lines, int timeoutMs)
 {
     if (!QFileInfo::exists(socketPath))
         return false;
@@ -142,7 +161,7 @@ bool MonitorLink::sendLine(const QString& socketPath, int message, qint64 wParam
     socket.connectToServer(socketPath);
     if (!socket.waitForConnected(timeoutMs))
         return false;
-    socket.write(QByteArray::number(message) + ' ' + QByteArray::number(wParam) + ' ' + QByteArray::number(lParam) + '\n');
+    socket.write(lines);
     const bool written = socket.waitForBytesWritten(timeoutMs) || socket.bytesToWrite() == 0;
     socket.disconnectFromServer();
     if (socket.state() != QLocalSocket::UnconnectedState)
@@ -161,6 +180,27 @@ bool MonitorLink::monitorWindowExists() const
     if (ok)
         socket.disconnectFromServer();
     return ok;
+}
+
+MonitorState MonitorLink::monitorState() const
+{
+    const QString path = monitorSocketPath();
+    if (!QFileInfo::exists(path))
+        return MonitorState::Absent;
+    QLocalSocket socket;
+    socket.connectToServer(path);
+    if (!socket.waitForConnected(200))
+        return MonitorState::Absent;
+    socket.write(QByteArray(StateQuestion) + '\n');
+    socket.waitForBytesWritten(200);
+    while (!socket.canReadLine()) {
+        if (!socket.waitForReadyRead(300))
+            break;
+    }
+    const QByteArray answer = socket.canReadLine() ? socket.readLine(kMaxLine).trimmed() : QByteArray();
+    socket.disconnectFromServer();
+    // A monitor that accepts but does not say otherwise is taken as running.
+    return answer == StatePaused ? MonitorState::Paused : MonitorState::Running;
 }
 
 bool MonitorLink::postToMonitor(int message) const

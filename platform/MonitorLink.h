@@ -9,17 +9,21 @@
 //   1733 -> WMLOGINFOCHANGE, posted, wParam passed on
 //   1736 -> swallowed
 //   1744 -> WMCONTACTDATAFROMSCREEN, posted, wParam = log record id
-// Anything else, and malformed lines, are dropped.
+// A second start of the program uses the same socket: WMBRINGTOFRONT is posted as it comes, and
+// its "/co-" switch travels as 1744. Anything else, and malformed lines, are dropped.
 
 #include "platform/WindowMessages.h"
 
 #include <QObject>
 #include <QPointer>
+#include <QStringList>
 
 class QLocalServer;
 class QLocalSocket;
 
 namespace orvanta {
+
+enum class MonitorState { Absent, Running, Paused };
 
 class MonitorLink final : public QObject {
     Q_OBJECT
@@ -49,6 +53,8 @@ public:
 
     // Whether the monitor's window exists (its socket accepts a connection).
     [[nodiscard]] bool monitorWindowExists() const;
+    // What the monitor is doing now: Absent when its socket does not answer.
+    [[nodiscard]] MonitorState monitorState() const;
     // Posts a message (wParam and lParam 0) to the monitor; false when it is not there.
     bool postToMonitor(int message) const;
 
@@ -61,8 +67,18 @@ public:
     // Returns whether the message was one of the monitor's (and so handled).
     static bool filterMessage(QObject* target, int message, qint64 wParam, qint64 lParam);
 
+    // A second start hands its business to the running program: bring the main window to the
+    // front, then the "/co-" switch (a valid one) as 1744. False when nobody listens.
+    static bool handToRunningProgram(const QStringList& parameters, int timeoutMs = 1000);
+
+    // The monitor's answer to its state question, one line each.
+    static constexpr const char* StateQuestion = "STATE";
+    static constexpr const char* StateRunning = "running";
+    static constexpr const char* StatePaused = "paused";
+
 private:
     void readClient(QLocalSocket* socket);
+    static bool writeLines(const QString& socketPath, const QByteArray& lines, int timeoutMs);
 
     QLocalServer* m_server = nullptr;
     QPointer<QObject> m_target;

@@ -29,6 +29,8 @@ inline constexpr int WMDELETELOGITEM = WM_USER + 817;
 inline constexpr int WMOPENCONTACTPERLOG = WM_USER + 818;
 inline constexpr int WMPLAYVOICEBOXITEM = WM_USER + 819;
 inline constexpr int WMUPDATEVOICEBOXGRID = WM_USER + 820;
+// A second start of the program asks the running one to bring its main window to the front.
+inline constexpr int WMBRINGTOFRONT = WM_USER + 830;
 
 // From the monitor to the program, taken off the message loop before any window sees them.
 inline constexpr int WMMONITOR_LOGCHANGED_SEND = WM_USER + 705;   // 1729: send WMLOGINFOCHANGE

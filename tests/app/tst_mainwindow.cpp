@@ -5,6 +5,9 @@
 #include "tests/app/AppTestEnv.h"
 #include "tests/support/TestRegistry.h"
 #include "ui/calendar/PlannerCalendar.h"
+#include "ui/grid/GridController.h"
+#include "ui/grid/GridHeader.h"
+#include "ui/grid/GridView.h"
 #include "ui/navbar/AdvNavBar.h"
 #include "ui/scheme/ColorScheme.h"
 #include "ui/statusbar/PanelStatusBar.h"
@@ -48,6 +51,56 @@ class TestMainWindow final : public QObject {
     Q_OBJECT
 
 private Q_SLOTS:
+    void theLogAndTheBarsFitCommonWindowSizes()
+    {
+        AppTestEnv env;
+        env.db().exec(QStringLiteral("INSERT INTO LOG (LID, TSDATE, TSTIME, FROMBEZ, FROMPHONE, REGION, ONBEZ, CTYPE, "
+                                     "SERVICE, STATUS) VALUES (1, '2026-12-06', '23:59:58', 'Meier', '0301111', "
+                                     "'Frankfurt am Main', 'Büro', 0, 1, 'Nicht angenommen')"));
+        TLogform& w = env.window({}, defaultMainWindowFeatures());
+        w.show();
+        auto* grid = w.findChild<GridView*>(QStringLiteral("cxGrid1DBTableView1"));
+        QVERIFY(grid);
+        QTRY_COMPARE(grid->controller()->rowCount(), 1);
+        const auto section = [grid](const char* field) {
+            return grid->header()->sectionSize(
+                grid->controller()->columnByName(QStringLiteral("cxGrid1DBTableView1") + QLatin1String(field)));
+        };
+        // A cell shows its text uncut when the section holds it and the padding on both sides.
+        const auto holds = [grid](int width, const QString& text) {
+            return width >= grid->fontMetrics().horizontalAdvance(text) + 6;
+        };
+        // The classic size, 1024 x 700, and the default on a 1280 x 800 screen.
+        for (const QSize size : {QSize(922, 640), QSize(1024, 700), QSize(1088, 680)}) {
+            const QString at = QStringLiteral("%1x%2").arg(size.width()).arg(size.height());
+            w.resize(size);
+            QCoreApplication::processEvents();
+            QVERIFY2(holds(section("TSDATE"), QStringLiteral("06.12.2026")), qPrintable(at));
+            QVERIFY2(holds(section("TSTIME"), QStringLiteral("23:59:58")), qPrintable(at));
+            QVERIFY2(holds(section("STATUS"), QStringLiteral("Nicht angenommen")), qPrintable(at));
+            QVERIFY2(holds(section("STATUS"), QStringLiteral("Anrufbeantworter")), qPrintable(at));
+            // The row is filled and nothing scrolls sideways; the caller has the widest column.
+            QCOMPARE(grid->header()->length(), grid->header()->width());
+            QVERIFY2(section("FROMBEZ") > section("REGION"), qPrintable(at));
+            QVERIFY2(section("FROMBEZ") > section("TSDATE"), qPrintable(at));
+            // No tool button hides behind a bar's "»".
+            for (auto* bar : w.findChildren<QToolBar*>()) {
+                auto* more = bar->findChild<QWidget*>(QStringLiteral("qt_toolbar_ext_button"));
+                QVERIFY2(!more || !more->isVisible(), qPrintable(bar->objectName() + QLatin1Char(' ') + at));
+                for (QAction* a : bar->actions()) {
+                    if (a->isVisible() && !a->isSeparator())
+                        QVERIFY2(bar->widgetForAction(a)->isVisible(),
+                                 qPrintable(a->objectName() + QLatin1Char(' ') + at));
+                }
+            }
+        }
+        // Wide enough, the bars share one row again.
+        w.resize(1900, 900);
+        QCoreApplication::processEvents();
+        for (auto* bar : w.findChildren<QToolBar*>())
+            QVERIFY2(!w.toolBarBreak(bar), qPrintable(bar->objectName()));
+    }
+
     void layoutCarriesTheDesignedNamesAndTexts()
     {
         AppTestEnv env;

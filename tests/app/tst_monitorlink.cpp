@@ -166,9 +166,15 @@ private Q_SLOTS:
             return said.contains(text);
         };
         QTRY_VERIFY(monitorSaid("angehalten"));
+        QTRY_COMPARE(w.statusPanels()->panelText(1), QStringLiteral("Rufwarte angehalten"));
         QCOMPARE(call(QStringLiteral("0301111")), QByteArray("0"));
+        // Paused, the monitor still runs: it can be resumed or ended, not started again.
+        QVERIFY(w.findChild<QAction*>(QStringLiteral("_LogFo_MoniSTOP"))->isEnabled());
+        QVERIFY(w.findChild<QAction*>(QStringLiteral("_LogFo_CloseApp"))->isEnabled());
+        QVERIFY(!w.findChild<QAction*>(QStringLiteral("_LogFo_MoniSTART"))->isEnabled());
         w.findChild<QAction*>(QStringLiteral("_LogFo_MoniSTOP"))->trigger();
         QTRY_VERIFY(monitorSaid("fortgesetzt"));
+        QTRY_COMPARE(w.statusPanels()->panelText(1), QString());
         QVERIFY(call(QStringLiteral("0301111")).toInt() > 0);
         QTRY_COMPARE(w.statusPanels()->panelText(2), QStringLiteral("Protokolleinträge: 3"));
 
@@ -176,8 +182,79 @@ private Q_SLOTS:
         w.findChild<QAction*>(QStringLiteral("_LogFo_CloseApp"))->trigger();
         QVERIFY(monitor.waitForFinished(10000));
         QCOMPARE(monitor.exitCode(), 0);
-        w.refreshMonitorState();
-        QVERIFY(w.findChild<QAction*>(QStringLiteral("_LogFo_MoniSTART"))->isEnabled());
+        QTRY_VERIFY(w.findChild<QAction*>(QStringLiteral("_LogFo_MoniSTART"))->isEnabled());
+        QVERIFY(!w.findChild<QAction*>(QStringLiteral("_LogFo_MoniSTOP"))->isEnabled());
+    }
+
+    void oneMonitorAtATime()
+    {
+        QVERIFY2(QFileInfo::exists(rufwarteProgram()), "the rufwarte program is missing from the build");
+        AppTestEnv env; // a private runtime folder and the database in the registry stand-in
+        const QString link = MonitorLink::monitorSocketPath();
+        const auto startMonitor = [](QProcess& p) {
+            p.setProcessChannelMode(QProcess::MergedChannels);
+            p.start(rufwarteProgram(), {QStringLiteral("run")});
+            return p.waitForStarted();
+        };
+        const auto answers = [] { return MonitorLink::sendLine(MonitorLink::monitorSocketPath(), 0, 0, 0, 500); };
+
+        QProcess first;
+        QVERIFY(startMonitor(first));
+        QTRY_VERIFY_WITH_TIMEOUT(answers(), 10000);
+
+        // A second one says so and ends; the first one's link stays and still answers.
+        QProcess second;
+        QVERIFY(startMonitor(second));
+        QVERIFY(second.waitForFinished(10000));
+        QCOMPARE(second.exitCode(), 1);
+        QVERIFY2(second.readAll().contains("Die Rufwarte läuft bereits."), "no word of the running monitor");
+        QVERIFY(QFileInfo::exists(link));
+        QVERIFY(answers());
+        QCOMPARE(first.state(), QProcess::Running);
+
+        // A monitor that died leaves its link file behind; the next start replaces it.
+        first.kill();
+        QVERIFY(first.waitForFinished(5000));
+        QVERIFY(QFileInfo::exists(link));
+        QVERIFY(!answers());
+        QProcess third;
+        QVERIFY(startMonitor(third));
+        QTRY_VERIFY_WITH_TIMEOUT(answers(), 10000);
+        QCOMPARE(third.state(), QProcess::Running);
+
+        // "rufwarte quit" ends it and returns once it has ended.
+        QProcess quit;
+        quit.start(rufwarteProgram(), {QStringLiteral("quit")});
+        QVERIFY(quit.waitForFinished(15000));
+        QCOMPARE(quit.exitCode(), 0);
+        QVERIFY(third.waitForFinished(1000));
+        QCOMPARE(third.exitCode(), 0);
+        QVERIFY(!QFileInfo::exists(link));
+        QProcess again;
+        again.start(rufwarteProgram(), {QStringLiteral("quit")});
+        QVERIFY(again.waitForFinished(10000));
+        QCOMPARE(again.exitCode(), 1);
+        QVERIFY(again.readAllStandardError().contains("Die Rufwarte läuft nicht."));
+    }
+
+    void theMonitorFindsTheRegistryBesideItself()
+    {
+        QVERIFY2(QFileInfo::exists(rufwarteProgram()), "the rufwarte program is missing from the build");
+        AppTestEnv env;
+        // An installed copy whose registry stand-in lies beside it, and no VARNIK_HKLM.
+        QTemporaryDir installed;
+        const QString program = installed.filePath(QStringLiteral("rufwarte"));
+        QVERIFY(QFile::copy(rufwarteProgram(), program));
+        QVERIFY(QFile::copy(qEnvironmentVariable("VARNIK_HKLM"), installed.filePath(QStringLiteral("registry.ini"))));
+        QProcessEnvironment penv = QProcessEnvironment::systemEnvironment();
+        penv.remove(QStringLiteral("VARNIK_HKLM"));
+        QProcess call;
+        call.setProcessEnvironment(penv);
+        call.start(program, {QStringLiteral("call"), QStringLiteral("0891234567")});
+        QVERIFY(call.waitForFinished(20000));
+        QVERIFY2(call.exitCode() == 0, call.readAllStandardError().constData());
+        QVERIFY(call.readAllStandardOutput().trimmed().toInt() > 0);
+        QCOMPARE(env.db().scalar(QStringLiteral("SELECT COUNT(*) FROM LOG WHERE FROMPHONE = '0891234567'")).toInt(), 1);
     }
 
 private:

@@ -1,5 +1,7 @@
+#include "app/MainWindowFeatures.h"
 #include "app/Startup.h"
 #include "platform/NamedMutex.h"
+#include "tests/app/AppTestEnv.h"
 #include "tests/TestPaths.h"
 #include "tests/support/TestRegistry.h"
 
@@ -77,6 +79,51 @@ private Q_SLOTS:
         QCOMPARE(first.state(), QProcess::Running);
         first.kill();
         first.waitForFinished(5000);
+    }
+
+    void aSecondStartBringsTheRunningWindowForwardWithItsSwitch()
+    {
+        const QString built = QStringLiteral(ORVANTA_BIN_DIR "/orvanta");
+        QVERIFY2(QFileInfo::exists(built), "the orvanta program is missing from the build");
+        // This process is the first instance: it holds the mutex and its main window listens.
+        test::AppTestEnv env;
+        env.addCall(17, QStringLiteral("2024-05-14"), QStringLiteral("0891234567"));
+        std::unique_ptr<NamedMutex> instance;
+        QVERIFY(Startup::mayStart(instance));
+        std::vector<MainWindowFeature> f = defaultMainWindowFeatures();
+        f.push_back(test::plainWindows());
+        TLogform& w = env.window({}, f);
+        w.show();
+        w.showMinimized();
+        QVERIFY(w.isMinimized());
+
+        QProcessEnvironment penv = QProcessEnvironment::systemEnvironment();
+        penv.insert(QStringLiteral("QT_QPA_PLATFORM"), QStringLiteral("offscreen"));
+        const auto secondStart = [&](const QStringList& parameters) {
+            QProcess second;
+            second.setProcessEnvironment(penv);
+            second.start(built, parameters);
+            if (!second.waitForFinished(10000) || second.exitStatus() != QProcess::NormalExit)
+                return -1;
+            // No dialog and nothing said.
+            return second.readAll().isEmpty() ? second.exitCode() : -2;
+        };
+        QCOMPARE(secondStart({QStringLiteral("/co-17")}), 0);
+        QTRY_VERIFY(!w.isMinimized());
+        QTRY_VERIFY(!w.editWindows().allFree());
+        QCOMPARE(w.editWindows().at(0)->property("callerNumber").toString(), QStringLiteral("0891234567"));
+        QVERIFY(env.dialogs().texts().isEmpty());
+
+        // A bad switch or one with more parameters only brings the window forward.
+        w.showMinimized();
+        QCOMPARE(secondStart({QStringLiteral("/co-x")}), 0);
+        QTRY_VERIFY(!w.isMinimized());
+        w.showMinimized();
+        QCOMPARE(secondStart({QStringLiteral("/co-17"), QStringLiteral("x")}), 0);
+        QTRY_VERIFY(!w.isMinimized());
+        QTest::qWait(200);
+        QCOMPARE(w.editWindows().size(), 1); // no second contact window
+        QVERIFY(env.dialogs().texts().isEmpty());
     }
 
     void terminationEndsTheRunEvenUnderAMessageBox()

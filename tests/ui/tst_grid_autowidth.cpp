@@ -9,6 +9,8 @@
 #include <QScrollBar>
 #include <QTest>
 
+#include <functional>
+
 using namespace orvanta;
 
 namespace {
@@ -24,7 +26,7 @@ struct Fixture {
     GridView view;
     std::vector<int> cols;
 
-    explicit Fixture(bool autoWidth = true, int width = 500)
+    explicit Fixture(bool autoWidth = true, int width = 500, const std::function<void(GridColumn&)>& adjust = {})
     {
         for (int i = 0; i < 40; ++i) {
             const quint32 r = src.appendRow();
@@ -38,7 +40,10 @@ struct Fixture {
         const char* fields[] = {"LID", "NAME", "ABID", "STATUS", "NOTE"};
         for (int i = 0; i < 5; ++i) {
             const QString field = QLatin1String(fields[i]);
-            cols.push_back(view.addColumn(GridColumn(QLatin1Char('c') + field, field, field, i, widths[i])));
+            GridColumn column(QLatin1Char('c') + field, field, field, i, widths[i]);
+            if (adjust)
+                adjust(column);
+            cols.push_back(view.addColumn(column));
         }
         view.setSource(&src);
         view.resize(width, 300);
@@ -184,6 +189,58 @@ private Q_SLOTS:
         f.dragRightEdge(f.cols[4], -20);
         f.verifyFilled();
         QCOMPARE(f.sizes(), pinned);
+    }
+
+    void fixedColumnsKeepTheirWidthAndNoneFallsBelowItsMinimum()
+    {
+        // LID keeps its 40 pixels; ABID never gets less than 60; the rest stretch by 120 : 80 : 50.
+        Fixture f(true, 500, [](GridColumn& c) {
+            if (c.fieldName == QLatin1String("LID"))
+                c.stretches = false;
+            if (c.fieldName == QLatin1String("ABID"))
+                c.minWidth = 60;
+        });
+        const auto verifyStretching = [&f](bool abidAtMinimum) {
+            const int rest = f.header()->width() - 40 - (abidAtMinimum ? 60 : 0);
+            const int sum = abidAtMinimum ? 250 : 280;
+            const std::pair<int, int> stretching[] = {{f.cols[1], 120}, {f.cols[3], 80}, {f.cols[4], 50}};
+            for (const auto& [c, weight] : stretching) {
+                const double expected = double(rest) * weight / sum;
+                QVERIFY2(std::abs(f.size(c) - expected) <= 1.0,
+                         qPrintable(QStringLiteral("column %1: %2, expected %3").arg(c).arg(f.size(c)).arg(expected)));
+            }
+        };
+        f.verifyFilled();
+        QCOMPARE(f.size(f.cols[0]), 40);
+        QCOMPARE(f.size(f.cols[2]), 60); // its share (30 of 280) would be less
+        verifyStretching(true);
+        f.view.resize(1200, 300);
+        f.verifyFilled();
+        QCOMPARE(f.size(f.cols[0]), 40);
+        QVERIFY(f.size(f.cols[2]) > 60);
+        verifyStretching(false);
+
+        // Narrower than the minimums together: nothing is cut below them, the view scrolls sideways.
+        f.view.resize(110, 300);
+        QCOMPARE(f.size(f.cols[0]), 40);
+        QCOMPARE(f.size(f.cols[2]), 60);
+        QVERIFY(f.view.horizontalScrollBar()->maximum() > 0);
+        QCOMPARE(f.view.horizontalScrollBar()->maximum(), f.header()->length() - f.view.viewport()->width());
+
+        // A stored layout's widths are the weights again, within the same rules.
+        f.view.resize(500, 300);
+        GridController* g = f.view.controller();
+        g->setColumnWidth(f.cols[0], 70);
+        g->setColumnWidth(f.cols[2], 20);
+        f.verifyFilled();
+        QCOMPARE(f.size(f.cols[0]), 70);
+        QCOMPARE(f.size(f.cols[2]), 60);
+
+        // With only fixed columns shown they fill the row between them.
+        for (const int c : {f.cols[1], f.cols[2], f.cols[3], f.cols[4]})
+            g->setColumnVisible(c, false);
+        f.verifyFilled();
+        QCOMPARE(f.size(f.cols[0]), f.header()->width());
     }
 
     void offKeepsEveryColumnsOwnWidth()

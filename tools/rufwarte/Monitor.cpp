@@ -7,10 +7,12 @@
 #include "db/FbTransaction.h"
 #include "phone/AreaCodes.h"
 #include "platform/AppException.h"
+#include "platform/NamedMutex.h"
 #include "platform/Registry.h"
 #include "tools/demo/CallFactory.h"
 
 #include <QDateTime>
+#include <QFileInfo>
 #include <QLocalServer>
 #include <QLocalSocket>
 
@@ -111,31 +113,55 @@ Monitor::Monitor()
         static demo::CallFactory factory(static_cast<quint32>(QDateTime::currentSecsSinceEpoch()));
         logCall(factory.randomCaller().number, QStringLiteral("3012345670"), false);
     });
+    m_socketWatch.setInterval(2000);
+    connect(&m_socketWatch, &QTimer::timeout, this, &Monitor::keepSocket);
 }
 
 Monitor::~Monitor()
 {
-    if (m_server) {
+    // Only the monitor that owns the socket removes it: a refused second one leaves it alone.
+    if (m_server && m_server->isListening()) {
         m_server->close();
         QLocalServer::removeServer(MonitorLink::monitorSocketPath());
     }
 }
 
+bool Monitor::isRunning()
+{
+    return NamedMutex::isHeld(QString::fromLatin1(MutexName))
+        || MonitorLink::sendLine(MonitorLink::monitorSocketPath(), 0, 0, 0, 300);
+}
+
 bool Monitor::start(QString& error)
 {
+    auto instance = std::make_unique<NamedMutex>(QString::fromLatin1(MutexName));
+    // The mutex dies with its holder; a socket that still answers belongs to a monitor that
+    // runs without it.
+    if (instance->alreadyExists() || MonitorLink::sendLine(MonitorLink::monitorSocketPath(), 0, 0, 0, 300)) {
+        error = QStringLiteral("Die Rufwarte läuft bereits.");
+        return false;
+    }
+    m_instance = std::move(instance);
     try {
         m_db = connectFromRegistry();
     } catch (const AppException& e) {
         error = QStringLiteral("Keine Verbindung zur Datenbank: ") + e.message();
         return false;
     }
+    if (!listen(error))
+        return false;
+    m_socketWatch.start();
+    say(QStringLiteral("Rufwarte läuft (%1).").arg(MonitorLink::monitorSocketPath()));
+    return true;
+}
+
+bool Monitor::listen(QString& error)
+{
+    delete m_server;
     m_server = new QLocalServer(this);
     m_server->setSocketOptions(QLocalServer::UserAccessOption);
     const QString path = MonitorLink::monitorSocketPath();
-    if (MonitorLink::sendLine(path, 0, 0, 0, 300)) {
-        error = QStringLiteral("Die Rufwarte läuft bereits.");
-        return false;
-    }
+    // Holding the mutex, any socket file here is a dead monitor's.
     QLocalServer::removeServer(path);
     if (!m_server->listen(path)) {
         error = QStringLiteral("Der Nachrichtenkanal \"%1\" kann nicht geöffnet werden.").arg(path);
@@ -154,8 +180,16 @@ bool Monitor::start(QString& error)
             read();
         }
     });
-    say(QStringLiteral("Rufwarte läuft (%1).").arg(path));
     return true;
+}
+
+void Monitor::keepSocket()
+{
+    if (QFileInfo::exists(MonitorLink::monitorSocketPath()))
+        return;
+    QString error;
+    if (!listen(error))
+        say(error);
 }
 
 void Monitor::setAutoCallInterval(int seconds)
@@ -198,6 +232,10 @@ void Monitor::handleLine(const QByteArray& line, QLocalSocket* socket)
         const bool post = parts.size() >= 4 && parts[3] == "post";
         const int lid = logCall(QString::fromUtf8(parts[1]), parts.size() >= 3 ? QString::fromUtf8(parts[2]) : QString(), post);
         socket->write(QByteArray::number(lid) + '\n');
+        return;
+    }
+    if (command == MonitorLink::StateQuestion) {
+        socket->write(QByteArray(m_paused ? MonitorLink::StatePaused : MonitorLink::StateRunning) + '\n');
         return;
     }
     if (command == "CONTACT" && parts.size() == 2) {

@@ -1,7 +1,8 @@
 #pragma once
 // The running monitor: listens on its own socket for the program's quit (1735) and
 // pause/resume (1740) messages and for the commands of the command line ("CALL <number>
-// [<called number>]", "CONTACT <log id>"); logs calls into the database and tells the program.
+// [<called number>]", "CONTACT <log id>", "STATE"); logs calls into the database and tells the
+// program. One runs at a time: it holds the mutex "Varnik Rufwarte" while it runs.
 
 #include <QObject>
 #include <QTimer>
@@ -13,6 +14,7 @@ class QLocalSocket;
 
 namespace orvanta {
 class FbAttachment;
+class NamedMutex;
 }
 
 namespace orvanta::rufwarte {
@@ -21,8 +23,13 @@ class Monitor final : public QObject {
     Q_OBJECT
 
 public:
+    static constexpr const char* MutexName = "Varnik Rufwarte";
+
     Monitor();
     ~Monitor() override;
+
+    // Whether a monitor runs now (holds the mutex, or answers on the socket).
+    [[nodiscard]] static bool isRunning();
 
     // Connects with the registry's connection data and opens the socket; false with a message.
     bool start(QString& error);
@@ -41,10 +48,15 @@ Q_SIGNALS:
 
 private:
     void handleLine(const QByteArray& line, QLocalSocket* socket);
+    bool listen(QString& error);
+    // A socket file removed under a running monitor would cut the program off from it.
+    void keepSocket();
 
+    std::unique_ptr<NamedMutex> m_instance;
     std::unique_ptr<FbAttachment> m_db;
     QLocalServer* m_server = nullptr;
     QTimer m_autoCall;
+    QTimer m_socketWatch;
     bool m_paused = false;
 };
 

@@ -8,21 +8,29 @@
 //   rufwarte call NUMBER [--msn MSN] [--post]
 //       logs an incoming call now and tells the program (through the running monitor if any)
 //   rufwarte contact LOGID      asks the program to make a contact of that call's caller
-//   rufwarte quit | pause       sends the monitor quit or pause/resume
+//   rufwarte quit | pause       sends the monitor quit (and waits for it to end) or pause/resume
+//
+// The registry stand-in is $VARNIK_HKLM; when that is unset, "registry.ini" in the program folder
+// (the folder of this program, or --program-folder), where "setup" writes it.
 
 #include "platform/MonitorLink.h"
 #include "db/SharedEngine.h"
 #include "db/FbAttachment.h"
 #include "phone/AreaCodes.h"
 #include "platform/AppException.h"
+#include "platform/NamedMutex.h"
 #include "platform/ProgramFolder.h"
 #include "tools/rufwarte/Monitor.h"
 #include "tools/rufwarte/MonitorSetup.h"
 
 #include <QCommandLineParser>
 #include <QCoreApplication>
+#include <QDeadlineTimer>
+#include <QFile>
 #include <QDir>
+#include <QFileInfo>
 #include <QLocalSocket>
+#include <QThread>
 
 #include <csignal>
 #include <cstdio>
@@ -104,6 +112,11 @@ int main(int argc, char* argv[])
     const QString folder = parser.isSet(folderOpt) ? QDir(parser.value(folderOpt)).absolutePath() + QLatin1Char('/')
                                                    : programFolder();
     setProgramFolder(folder);
+    // An installation is one folder: the monitor finds its registry key beside itself.
+    const QString besideProgram = folder + QStringLiteral("registry.ini");
+    if (qEnvironmentVariableIsEmpty("VARNIK_HKLM")
+        && (command == QLatin1String("setup") || QFileInfo::exists(besideProgram)))
+        qputenv("VARNIK_HKLM", QFile::encodeName(besideProgram));
 
     if (command == QLatin1String("setup")) {
         rufwarte::SetupOptions o;
@@ -158,10 +171,23 @@ int main(int argc, char* argv[])
         return 0;
     }
     if (command == QLatin1String("quit") || command == QLatin1String("pause")) {
-        const int message = command == QLatin1String("quit") ? MonitorLink::MonitorQuit : MonitorLink::MonitorPauseResume;
+        const bool quit = command == QLatin1String("quit");
+        const int message = quit ? MonitorLink::MonitorQuit : MonitorLink::MonitorPauseResume;
         if (!MonitorLink::sendLine(MonitorLink::monitorSocketPath(), message, 0, 0)) {
-            print(stderr, QStringLiteral("Die Rufwarte läuft nicht."));
+            print(stderr, rufwarte::Monitor::isRunning() ? QStringLiteral("Die Rufwarte antwortet nicht.")
+                                                         : QStringLiteral("Die Rufwarte läuft nicht."));
             return 1;
+        }
+        if (quit) {
+            // Done when the monitor has ended, so that a start right after this one succeeds.
+            const QDeadlineTimer deadline(10000);
+            while (rufwarte::Monitor::isRunning()) {
+                if (deadline.hasExpired()) {
+                    print(stderr, QStringLiteral("Die Rufwarte hat sich nicht beendet."));
+                    return 1;
+                }
+                QThread::msleep(50);
+            }
         }
         return 0;
     }

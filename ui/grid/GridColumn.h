@@ -30,6 +30,11 @@ struct GridColumn {
     QString caption;
     int tag = 0;
     int width = 64;
+    // When the view fits its columns to its width: never narrower than minWidth (content that
+    // must not be cut, such as a date; 0 = the header's minimum), and only a column that
+    // stretches takes a share of the free space; the others keep their own width.
+    int minWidth = 0;
+    bool stretches = true;
     bool visible = true;
     Qt::Alignment alignment = Qt::AlignLeft | Qt::AlignVCenter;
     bool sortable = true;

@@ -11,6 +11,7 @@
 #include <QMenu>
 #include <QPainter>
 #include <QScrollBar>
+#include <QStyleOptionHeader>
 
 #include <algorithm>
 #include <utility>
@@ -21,13 +22,16 @@ constexpr int kIndent = 16;
 constexpr int kPad = 3;
 
 // Splits `total` pixels in proportion to `weights` so that the parts add up to exactly `total`.
-// A part whose share would fall below `minimum` gets the minimum and the others share the rest;
-// when even the minimums do not fit, every part is the minimum.
-std::vector<int> proportionalWidths(const std::vector<int>& weights, int total, int minimum)
+// A part whose share would fall below its minimum gets the minimum and the others share the
+// rest; when even the minimums do not fit, every part is its minimum.
+std::vector<int> proportionalWidths(const std::vector<int>& weights, int total, const std::vector<int>& minimums)
 {
     const size_t n = weights.size();
-    std::vector<int> out(n, minimum);
-    if (n == 0 || total <= minimum * static_cast<int>(n))
+    std::vector<int> out = minimums;
+    qint64 minimumSum = 0;
+    for (const int m : minimums)
+        minimumSum += m;
+    if (n == 0 || total <= minimumSum)
         return out;
     std::vector<bool> atMinimum(n, false);
     qint64 room = 0;
@@ -37,18 +41,18 @@ std::vector<int> proportionalWidths(const std::vector<int>& weights, int total, 
         weightSum = 0;
         for (size_t i = 0; i < n; ++i) {
             if (atMinimum[i])
-                room -= minimum;
+                room -= minimums[i];
             else
                 weightSum += std::max(1, weights[i]);
         }
         bool changed = false;
         for (size_t i = 0; i < n; ++i) {
-            if (!atMinimum[i] && room * std::max(1, weights[i]) < qint64{minimum} * weightSum) {
+            if (!atMinimum[i] && room * std::max(1, weights[i]) < qint64{minimums[i]} * weightSum) {
                 atMinimum[i] = true;
                 changed = true;
             }
         }
-        // The parts left average more than the minimum, so at least one always stays proportional.
+        // The total exceeds the sum of the minimums, so at least one part always stays proportional.
         if (!changed)
             break;
     }
@@ -208,6 +212,45 @@ std::vector<int> GridView::shownSections() const
     return out;
 }
 
+int GridView::minimumWidth(int section) const
+{
+    const int floor = m_header->minimumSectionSize();
+    return section < m_controller->columnCount() ? std::max(floor, m_controller->column(section).minWidth) : floor;
+}
+
+std::vector<int> GridView::fittedWidths(const std::vector<int>& sections, int available) const
+{
+    const int n = static_cast<int>(sections.size());
+    std::vector<int> out(sections.size(), 0);
+    const auto stretches = [this](int c) {
+        return c >= m_controller->columnCount() || m_controller->column(c).stretches;
+    };
+    const auto weight = [this](int c) {
+        return c < m_controller->columnCount() ? m_controller->column(c).width : m_header->sectionSize(c);
+    };
+    // Without a stretching column among them, all of them fill the row.
+    const bool anyStretches = std::any_of(sections.begin(), sections.end(), stretches);
+    std::vector<int> weights;
+    std::vector<int> minimums;
+    std::vector<int> sharing;
+    int rest = available;
+    for (int i = 0; i < n; ++i) {
+        const int c = sections[static_cast<size_t>(i)];
+        if (anyStretches && !stretches(c)) {
+            out[static_cast<size_t>(i)] = std::max(weight(c), minimumWidth(c));
+            rest -= out[static_cast<size_t>(i)];
+            continue;
+        }
+        sharing.push_back(i);
+        weights.push_back(weight(c));
+        minimums.push_back(minimumWidth(c));
+    }
+    const std::vector<int> shared = proportionalWidths(weights, rest, minimums);
+    for (size_t k = 0; k < sharing.size(); ++k)
+        out[static_cast<size_t>(sharing[k])] = shared[k];
+    return out;
+}
+
 // The columns' own widths stay untouched here: they are the weights, so resizing the window
 // back and forth always gives the same sections and the stored layout keeps the proportions.
 void GridView::fitColumns()
@@ -215,11 +258,8 @@ void GridView::fitColumns()
     if (!m_autoWidth)
         return;
     const std::vector<int> shown = shownSections();
-    std::vector<int> weights;
-    for (const int c : shown)
-        weights.push_back(c < m_controller->columnCount() ? m_controller->column(c).width : m_header->sectionSize(c));
     const int available = std::max(0, viewport()->width() - indentWidth());
-    const std::vector<int> widths = proportionalWidths(weights, available, m_header->minimumSectionSize());
+    const std::vector<int> widths = fittedWidths(shown, available);
     const bool wasSyncing = std::exchange(m_syncing, true);
     for (size_t i = 0; i < shown.size(); ++i) {
         if (m_header->sectionSize(shown[i]) != widths[i])
@@ -228,10 +268,10 @@ void GridView::fitColumns()
     m_syncing = wasSyncing;
 }
 
-// The resized column takes its space from the columns to its right, which share the rest by
-// their own widths; the last column's right edge is the view's edge and stays put. The new pixel
-// widths become the columns' widths when the drag ends, so a refit reproduces them exactly and
-// the result depends only on where the mouse was let go, not on the way there.
+// The resized column takes its space from the columns to its right, which share the rest as a
+// fit does; the last column's right edge is the view's edge and stays put. The new pixel widths
+// become the columns' widths when the drag ends, so a refit reproduces them exactly and the
+// result depends only on where the mouse was let go, not on the way there.
 void GridView::columnResizedByUser(int logical, int size)
 {
     const std::vector<int> shown = shownSections();
@@ -242,19 +282,17 @@ void GridView::columnResizedByUser(int logical, int size)
         return;
     }
     const size_t k = static_cast<size_t>(it - shown.begin());
-    const int minimum = m_header->minimumSectionSize();
     const int available = std::max(0, viewport()->width() - indentWidth());
     int left = 0;
     for (size_t i = 0; i < k; ++i)
         left += m_header->sectionSize(shown[i]);
-    std::vector<int> rightWeights;
-    for (size_t i = k + 1; i < shown.size(); ++i) {
-        const int c = shown[i];
-        rightWeights.push_back(c < m_controller->columnCount() ? m_controller->column(c).width : m_header->sectionSize(c));
-    }
-    const int maxSize = available - left - minimum * static_cast<int>(rightWeights.size());
-    size = std::clamp(size, minimum, std::max(minimum, maxSize));
-    const std::vector<int> right = proportionalWidths(rightWeights, available - left - size, minimum);
+    const std::vector<int> rightSections(it + 1, shown.end());
+    int rightMinimum = 0;
+    for (const int w : fittedWidths(rightSections, 0))
+        rightMinimum += w;
+    const int minimum = minimumWidth(logical);
+    size = std::clamp(size, minimum, std::max(minimum, available - left - rightMinimum));
+    const std::vector<int> right = fittedWidths(rightSections, available - left - size);
 
     const bool wasSyncing = std::exchange(m_syncing, true);
     if (m_header->sectionSize(logical) != size)
@@ -269,6 +307,25 @@ void GridView::columnResizedByUser(int logical, int size)
         takeSectionWidths();
     updateScrollBars();
     viewport()->update();
+}
+
+int GridView::contentWidth(const QStringList& cellTexts, const QString& caption, bool withImage, bool sortArrow) const
+{
+    const QFontMetrics fm = fontMetrics();
+    int cell = 0;
+    for (const QString& text : cellTexts)
+        cell = std::max(cell, fm.horizontalAdvance(text));
+    int image = 0;
+    if (withImage)
+        image = (m_images.isEmpty() ? 16 : m_images.first().width()) + kPad;
+    // The style's own measure of a header section.
+    QStyleOptionHeader opt;
+    opt.initFrom(m_header);
+    opt.text = caption;
+    opt.sortIndicator = sortArrow ? QStyleOptionHeader::SortDown : QStyleOptionHeader::None;
+    const int header = m_header->style()->sizeFromContents(QStyle::CT_HeaderSection, &opt, QSize(), m_header).width();
+    // One more pixel for the grid line at the cell's right edge.
+    return std::max(cell + image + 2 * kPad + 1, header);
 }
 
 void GridView::takeSectionWidths()

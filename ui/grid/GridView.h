@@ -71,12 +71,18 @@ public:
     void setGridLineColor(const QColor& color) { m_lineColor = color; viewport()->update(); }
     void setGroupRowColor(const QColor& color) { m_groupColor = color; viewport()->update(); }
     [[nodiscard]] QColor groupRowColor() const { return m_groupColor; }
-    // On: the visible columns always fill the width exactly, each in proportion to its own width,
-    // and there is no horizontal scrolling; a column the user resizes trades space with the
-    // columns to its right. Off: every column has its own width. Before the first call the last
-    // column stretches to the view's edge.
+    // On: the visible columns fill the width exactly: the columns that stretch share what the
+    // others leave in proportion to their own widths, none narrower than its minimum; only when
+    // even the minimums do not fit does the view scroll sideways. A column the user resizes trades
+    // space with the columns to its right. Off: every column has its own width. Before the first
+    // call the last column stretches to the view's edge.
     void setAutoWidth(bool on);
     [[nodiscard]] bool autoWidth() const { return m_autoWidth; }
+    // The width a column needs to show these cell texts and its caption uncut, in this view's
+    // fonts and style (withImage: an image stands before the text; sortArrow: room for the arrow
+    // of a column that is sorted).
+    [[nodiscard]] int contentWidth(const QStringList& cellTexts, const QString& caption, bool withImage = false,
+                                   bool sortArrow = false) const;
 
     // Viewport geometry of a row, empty when it is scrolled out.
     [[nodiscard]] QRect rowRect(int row) const;
@@ -112,6 +118,9 @@ private:
     void updateGeometries();
     void updateScrollBars();
     void fitColumns();
+    // Widths of the given sections sharing `available` pixels by the rule of setAutoWidth.
+    [[nodiscard]] std::vector<int> fittedWidths(const std::vector<int>& sections, int available) const;
+    [[nodiscard]] int minimumWidth(int section) const;
     void columnResizedByUser(int logical, int size);
     void takeSectionWidths();
     [[nodiscard]] std::vector<int> shownSections() const;
