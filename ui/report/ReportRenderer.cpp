@@ -1,0 +1,170 @@
+#include "ui/report/ReportRenderer.h"
+
+#include "platform/AppException.h"
+#include "ui/report/ReportLayout.h"
+
+#include <QAbstractTextDocumentLayout>
+#include <QFile>
+#include <QFontMetricsF>
+#include <QPainter>
+#include <QPdfWriter>
+#include <QPrinter>
+#include <QTextDocument>
+
+namespace orvanta {
+
+namespace {
+
+constexpr double kDpm = ReportLayout::kDotsPerMm;
+
+QRectF dots(const QRectF& mm, double y)
+{
+    return QRectF(mm.x() * kDpm, y + mm.y() * kDpm, mm.width() * kDpm, mm.height() * kDpm);
+}
+
+QFont fontOf(const ReportDefinition& definition, const ReportFont& own)
+{
+    QFont font(own.family.isEmpty() ? definition.font.family : own.family);
+    const double points = own.size > 0 ? own.size : definition.font.size;
+    // Pixel sizes in layout dots keep text the same size on every device the painter is scaled to.
+    font.setPixelSize(std::max(1, qRound(points * ReportLayout::kDotsPerInch / 72)));
+    font.setBold(own.bold);
+    font.setItalic(own.italic);
+    return font;
+}
+
+void paintRich(QPainter& painter, const ReportLayout& layout, const ReportLayout::Placement& placement)
+{
+    QTextDocument* doc = layout.richDocument(placement.rich);
+    if (!doc)
+        return;
+    const ReportItem& item = *placement.rich;
+    const double top = placement.continued ? placement.y : placement.y + item.rect.y() * kDpm;
+    painter.save();
+    painter.translate(item.rect.x() * kDpm, top - placement.richFrom);
+    const QRectF slice(0, placement.richFrom, doc->textWidth(), placement.richTo - placement.richFrom);
+    painter.setClipRect(slice, Qt::IntersectClip);
+    QAbstractTextDocumentLayout::PaintContext context;
+    // Lines touching the slice's edges belong to the neighbouring page: without the inset they
+    // would be written there too, invisible but found by search and copy.
+    context.clip = slice.adjusted(0, 1, 0, -1);
+    context.palette.setColor(QPalette::Text, item.color);
+    doc->documentLayout()->draw(&painter, context);
+    painter.restore();
+}
+
+void paintBand(QPainter& painter, const ReportLayout& layout, const ReportLayout::Placement& placement, int pageIndex)
+{
+    const ReportBand& band = *placement.band;
+    const ReportDefinition& definition = layout.definition();
+    if (placement.continued) {
+        paintRich(painter, layout, placement);
+        return;
+    }
+    if (layout.isShaded(band, placement.row))
+        painter.fillRect(QRectF(0, placement.y, definition.printable().width() * kDpm, band.height * kDpm), band.shade);
+    for (const ReportItem& item : band.items) {
+        switch (item.kind) {
+        case ReportItem::Kind::Text: {
+            const QFont font = fontOf(definition, item.font);
+            const QRectF box = dots(item.rect, placement.y);
+            const QString text = layout.expand(item.text, placement.row, pageIndex);
+            painter.setFont(font);
+            painter.setPen(item.color);
+            const QString shown = QFontMetricsF(font).elidedText(text, Qt::ElideRight, box.width());
+            painter.drawText(box, int(item.align) | Qt::TextSingleLine, shown);
+            break;
+        }
+        case ReportItem::Kind::RichText:
+            if (&item == placement.rich)
+                paintRich(painter, layout, placement);
+            break;
+        case ReportItem::Kind::Line:
+            painter.setPen(QPen(item.color, std::max(item.penWidth * kDpm, 1.0)));
+            painter.drawLine(QLineF(item.rect.topLeft() * kDpm, item.rect.bottomRight() * kDpm).translated(0, placement.y));
+            break;
+        case ReportItem::Kind::Box: {
+            const QRectF box = dots(item.rect, placement.y);
+            if (item.fill.isValid())
+                painter.fillRect(box, item.fill);
+            if (item.penWidth > 0) {
+                painter.setPen(QPen(item.color, item.penWidth * kDpm));
+                painter.setBrush(Qt::NoBrush);
+                painter.drawRect(box);
+            }
+            break;
+        }
+        }
+    }
+}
+
+} // namespace
+
+void ReportRenderer::paintPage(QPainter& painter, const ReportLayout& layout, int pageIndex, const QRectF& target)
+{
+    const QSizeF paper = layout.paperDots();
+    painter.save();
+    painter.fillRect(target, Qt::white);
+    painter.translate(target.topLeft());
+    painter.scale(target.width() / paper.width(), target.height() / paper.height());
+    painter.setClipRect(QRectF(QPointF(0, 0), paper), Qt::IntersectClip);
+    painter.setRenderHint(QPainter::Antialiasing);
+    painter.setRenderHint(QPainter::TextAntialiasing);
+    const QMarginsF& margins = layout.definition().margins;
+    painter.translate(margins.left() * kDpm, margins.top() * kDpm);
+    if (pageIndex >= 0 && pageIndex < layout.pageCount())
+        for (const ReportLayout::Placement& placement : layout.page(pageIndex).placements)
+            paintBand(painter, layout, placement, pageIndex);
+    painter.restore();
+}
+
+void ReportRenderer::print(QPagedPaintDevice* device, ReportLayout& layout, int from, int to, int copies)
+{
+    layout.layoutAll();
+    from = std::max(from, 1);
+    to = std::min(to, layout.pageCount());
+    if (copies <= 0 || from > to)
+        return;
+    const QSizeF paper = layout.definition().paper;
+    const bool landscape = paper.width() > paper.height();
+    const QPageSize size(landscape ? paper.transposed() : paper, QPageSize::Millimeter);
+    if (auto* printer = dynamic_cast<QPrinter*>(device))
+        printer->setFullPage(true);
+    device->setPageLayout(QPageLayout(size, landscape ? QPageLayout::Landscape : QPageLayout::Portrait, QMarginsF()));
+    QPainter painter;
+    if (!painter.begin(device))
+        throw AppException(QStringLiteral("Der Drucker oder die Datei nimmt den Bericht nicht an."));
+    const double dpi = device->logicalDpiX();
+    const QRectF target(0, 0, paper.width() / 25.4 * dpi, paper.height() / 25.4 * device->logicalDpiY());
+    bool first = true;
+    for (int copy = 0; copy < copies; ++copy) {
+        for (int page = from; page <= to; ++page) {
+            if (!first && !device->newPage()) {
+                painter.end();
+                throw AppException(QStringLiteral("Der Drucker hat den Auftrag abgebrochen (Seite %1).").arg(page));
+            }
+            first = false;
+            ReportRenderer::paintPage(painter, layout, page - 1, target);
+        }
+    }
+    if (!painter.end())
+        throw AppException(QStringLiteral("Der Bericht konnte nicht vollständig ausgegeben werden."));
+}
+
+void ReportRenderer::writePdf(const QString& path, ReportLayout& layout)
+{
+    QFile file(path);
+    if (!file.open(QIODevice::WriteOnly))
+        throw AppException(QStringLiteral("Die Datei „%1“ kann nicht geschrieben werden: %2").arg(path, file.errorString()));
+    {
+        QPdfWriter writer(&file);
+        writer.setResolution(int(ReportLayout::kDotsPerInch));
+        writer.setCreator(QStringLiteral("Orvanta"));
+        writer.setTitle(layout.definition().title.isEmpty() ? layout.definition().name : layout.definition().title);
+        print(&writer, layout, 1, std::numeric_limits<int>::max());
+    }
+    if (file.error() != QFileDevice::NoError)
+        throw AppException(QStringLiteral("Die Datei „%1“ kann nicht geschrieben werden: %2").arg(path, file.errorString()));
+}
+
+} // namespace orvanta
