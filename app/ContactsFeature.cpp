@@ -3,6 +3,9 @@
 #include "app/AppServices.h"
 #include "app/TLogform.h"
 #include "contacts/ContactDeletion.h"
+#include "contacts/ContactReports.h"
+#include "db/TDM2.h"
+#include "platform/ErrorLog.h"
 #include "contacts/Tcontactlistframe.h"
 
 namespace orvanta {
@@ -42,6 +45,14 @@ void ContDelExecute(TLogform& w)
         f->Refresh_View(0);
 }
 
+void PrintContactOverviewExecute(TLogform& w)
+{
+    TDM2* dm = w.dataModule();
+    ReportOutcome outcome;
+    if (!DruckKontaktUebersicht(dm ? &dm->rave_ibsql : nullptr, outcome))
+        reportError(reportFailureEntry(QStringLiteral("DruckKontaktUebersicht"), outcome));
+}
+
 } // namespace
 
 void registerContactsFeature(TLogform& w)
@@ -52,6 +63,8 @@ void registerContactsFeature(TLogform& w)
     };
     w.actions().define(QStringLiteral("_LogFo_ContDel"), [&w] { ContDelExecute(w); },
                        [&w] { return contactChosen(w); });
+    w.actions().define(QStringLiteral("_LogFo_PrintContactOverview"), [&w] { PrintContactOverviewExecute(w); },
+                       [&w] { return w.contactFrame() && w.contactFrame()->isConnected(); });
 }
 
 } // namespace orvanta
