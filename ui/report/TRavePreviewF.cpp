@@ -338,6 +338,8 @@ void TRavePreviewF::pageEditDone()
 
 void TRavePreviewF::rv_PrintExecute()
 {
+    if (m_printDialog && !m_printDialog->isVisible())
+        delete m_printDialog; // closed, its deletion still pending
     if (m_printDialog) {
         m_printDialog->show();
         m_printDialog->raise();
@@ -391,7 +393,7 @@ void TRavePreviewF::wheelEvent(QWheelEvent* event)
 
 bool TRavePreviewF::eventFilter(QObject* watched, QEvent* event)
 {
-    if (watched == m_scroll->viewport() && event->type() == QEvent::Wheel) {
+    if (m_scroll && watched == m_scroll->viewport() && event->type() == QEvent::Wheel) {
         wheelEvent(static_cast<QWheelEvent*>(event));
         return true;
     }
