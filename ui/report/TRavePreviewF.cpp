@@ -113,17 +113,21 @@ TRavePreviewF::TRavePreviewF(ReportLayout& layout, const QString& title, QWidget
     auto* column = new QVBoxLayout(this);
     column->setContentsMargins(0, 0, 0, 0);
     column->setSpacing(0);
-    auto* bars = new QHBoxLayout;
-    bars->setSpacing(2);
-    column->addLayout(bars);
+    for (QHBoxLayout*& row : m_barRows) {
+        row = new QHBoxLayout;
+        row->setSpacing(2);
+        row->setContentsMargins(2, 1, 2, 1);
+        column->addLayout(row);
+    }
 
     QStyle* st = style();
-    auto bar = [&](const char* name, const QString& caption) {
+    auto bar = [&](const char* name, const QString& caption, Qt::ToolButtonStyle buttons) {
         auto* b = new QToolBar(caption, this);
         b->setObjectName(QLatin1String(name));
-        b->setToolButtonStyle(Qt::ToolButtonTextBesideIcon);
+        b->setToolButtonStyle(buttons);
         b->setMovable(false);
-        bars->addWidget(b);
+        b->setContextMenuPolicy(Qt::PreventContextMenu); // not customisable
+        m_bars.append(b);
         return b;
     };
     auto action = [&](QToolBar* b, const char* name, const QString& caption, QStyle::StandardPixmap icon) {
@@ -133,17 +137,17 @@ TRavePreviewF::TRavePreviewF(ReportLayout& layout, const QString& title, QWidget
         b->addAction(a);
         return a;
     };
-    QToolBar* end = bar("Beenden", QStringLiteral("Beenden"));
+    QToolBar* end = bar("Beenden", QStringLiteral("Beenden"), Qt::ToolButtonTextBesideIcon);
     connect(action(end, "rv_Close", QStringLiteral("Beenden"), QStyle::SP_DialogCloseButton), &QAction::triggered, this,
             &QWidget::close);
-    QToolBar* out = bar("Ausgabe", QStringLiteral("Ausgabe"));
+    QToolBar* out = bar("Ausgabe", QStringLiteral("Ausgabe"), Qt::ToolButtonTextBesideIcon);
     m_print = action(out, "rv_Print", QStringLiteral("Drucken"), QStyle::SP_DialogSaveButton);
     connect(m_print, &QAction::triggered, this, &TRavePreviewF::rv_PrintExecute);
     m_pdf = action(out, "rv_PDF", QStringLiteral("PDF"), QStyle::SP_FileIcon);
     m_pdf->setToolTip(QStringLiteral("Ausgeben als PDF"));
     connect(m_pdf, &QAction::triggered, this, &TRavePreviewF::rv_PDFExecute);
 
-    QToolBar* pages = bar("Seiten", QStringLiteral("Seiten"));
+    QToolBar* pages = bar("Seiten", QStringLiteral("Seiten"), Qt::ToolButtonIconOnly);
     m_first = action(pages, "rv_FirstPage", QStringLiteral("Erste Seite"), QStyle::SP_MediaSkipBackward);
     connect(m_first, &QAction::triggered, this, [this] { showPage(1); });
     m_prior = action(pages, "rv_PriorPage", QStringLiteral("Vorherige Seite"), QStyle::SP_MediaSeekBackward);
@@ -168,7 +172,7 @@ TRavePreviewF::TRavePreviewF(ReportLayout& layout, const QString& title, QWidget
     m_last = action(pages, "rv_LastPage", QStringLiteral("Letzte Seite"), QStyle::SP_MediaSkipForward);
     connect(m_last, &QAction::triggered, this, [this] { showPage(pageCount()); });
 
-    QToolBar* zoom = bar("Zoom", QStringLiteral("Zoom"));
+    QToolBar* zoom = bar("Zoom", QStringLiteral("Zoom"), Qt::ToolButtonIconOnly);
     auto* zoomOut = action(zoom, "rv_ZoomOut", QStringLiteral("Verkleinern"), QStyle::SP_ArrowDown);
     connect(zoomOut, &QAction::triggered, this, [this] {
         if (m_zoom > kZoomStep)
@@ -183,7 +187,7 @@ TRavePreviewF::TRavePreviewF(ReportLayout& layout, const QString& title, QWidget
     m_zoomText = new QLabel(QStringLiteral("Seitengröße:"), this);
     m_zoomText->setObjectName(QStringLiteral("dxBS1"));
     zoom->addWidget(m_zoomText);
-    bars->addStretch(1);
+    wrapBars();
 
     m_scroll = new QScrollArea(this);
     m_scroll->setObjectName(QStringLiteral("ScrollBox1"));
@@ -371,9 +375,31 @@ void TRavePreviewF::rv_PDFExecute()
     }
 }
 
+void TRavePreviewF::wrapBars()
+{
+    // The bars fill the first row as far as they fit and go on in the second, so that no button
+    // hides behind a bar's "»".
+    for (QHBoxLayout* row : m_barRows)
+        while (QLayoutItem* item = row->takeAt(0))
+            delete item;
+    int used = 0;
+    for (QToolBar* b : std::as_const(m_bars)) {
+        const int needed = b->sizeHint().width() + 2;
+        QHBoxLayout* row = used > 0 && used + needed > width() - 4 ? m_barRows[1] : m_barRows[0];
+        if (row == m_barRows[1])
+            used = width(); // the rest goes on in the second row
+        else
+            used += needed;
+        row->addWidget(b);
+    }
+    for (QHBoxLayout* row : m_barRows)
+        row->addStretch(1);
+}
+
 void TRavePreviewF::resizeEvent(QResizeEvent* event)
 {
     QWidget::resizeEvent(event);
+    wrapBars();
     if (isVisible())
         setZoom(fitWidthZoom());
 }

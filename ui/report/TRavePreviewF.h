@@ -10,6 +10,8 @@
 #include <functional>
 
 class QAction;
+class QHBoxLayout;
+class QToolBar;
 class QLabel;
 class QLineEdit;
 class QScrollArea;
@@ -66,6 +68,7 @@ protected:
 
 private:
     void layoutStep();
+    void wrapBars();
     void updateStatus();
     void rv_LastPageUpdate();
     void pageEditDone();
@@ -75,6 +78,8 @@ private:
     int m_page = 1;
     double m_zoom = 100;
     bool m_failed = false;
+    QList<QToolBar*> m_bars;
+    QHBoxLayout* m_barRows[2] = {};
     QWidget* m_pageView = nullptr;
     QScrollArea* m_scroll = nullptr;
     QStatusBar* m_status = nullptr;
