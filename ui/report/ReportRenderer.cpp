@@ -11,6 +11,8 @@
 #include <QPrinter>
 #include <QTextDocument>
 
+#include <unordered_map>
+
 namespace orvanta {
 
 namespace {
@@ -53,7 +55,29 @@ void paintRich(QPainter& painter, const ReportLayout& layout, const ReportLayout
     painter.restore();
 }
 
-void paintBand(QPainter& painter, const ReportLayout& layout, const ReportLayout::Placement& placement, int pageIndex)
+// Fonts and their metrics per item, made once per painted page rather than per cell.
+class FontCache {
+public:
+    struct Entry {
+        QFont font;
+        QFontMetricsF metrics;
+    };
+    const Entry& of(const ReportDefinition& definition, const ReportItem& item)
+    {
+        auto it = m_entries.find(&item);
+        if (it == m_entries.end()) {
+            const QFont font = fontOf(definition, item.font);
+            it = m_entries.emplace(&item, Entry{font, QFontMetricsF(font)}).first;
+        }
+        return it->second;
+    }
+
+private:
+    std::unordered_map<const ReportItem*, Entry> m_entries;
+};
+
+void paintBand(QPainter& painter, const ReportLayout& layout, const ReportLayout::Placement& placement, int pageIndex,
+               FontCache& fonts)
 {
     const ReportBand& band = *placement.band;
     const ReportDefinition& definition = layout.definition();
@@ -66,13 +90,30 @@ void paintBand(QPainter& painter, const ReportLayout& layout, const ReportLayout
     for (const ReportItem& item : band.items) {
         switch (item.kind) {
         case ReportItem::Kind::Text: {
-            const QFont font = fontOf(definition, item.font);
+            const FontCache::Entry& font = fonts.of(definition, item);
             const QRectF box = dots(item.rect, placement.y);
-            const QString text = layout.expand(item.text, placement.row, pageIndex);
-            painter.setFont(font);
+            QString text = layout.expand(item.text, placement.row, pageIndex);
+            if (text.isEmpty())
+                break;
+            // Placed by hand rather than through drawText(rect, flags): the same result for one
+            // line, without a text layout per cell, which is most of a long report's time.
+            double width = font.metrics.horizontalAdvance(text);
+            if (width > box.width()) {
+                text = font.metrics.elidedText(text, Qt::ElideRight, box.width());
+                width = font.metrics.horizontalAdvance(text);
+            }
+            const Qt::Alignment h = item.align & Qt::AlignHorizontal_Mask;
+            const double x = h == Qt::AlignRight ? box.right() - width
+                : h == Qt::AlignHCenter          ? box.left() + (box.width() - width) / 2
+                                                 : box.left();
+            const Qt::Alignment v = item.align & Qt::AlignVertical_Mask;
+            const double lineHeight = font.metrics.ascent() + font.metrics.descent();
+            const double top = v == Qt::AlignTop ? box.top()
+                : v == Qt::AlignBottom           ? box.bottom() - lineHeight
+                                                 : box.top() + (box.height() - lineHeight) / 2;
+            painter.setFont(font.font);
             painter.setPen(item.color);
-            const QString shown = QFontMetricsF(font).elidedText(text, Qt::ElideRight, box.width());
-            painter.drawText(box, int(item.align) | Qt::TextSingleLine, shown);
+            painter.drawText(QPointF(x, top + font.metrics.ascent()), text);
             break;
         }
         case ReportItem::Kind::RichText:
@@ -112,9 +153,10 @@ void ReportRenderer::paintPage(QPainter& painter, const ReportLayout& layout, in
     painter.setRenderHint(QPainter::TextAntialiasing);
     const QMarginsF& margins = layout.definition().margins;
     painter.translate(margins.left() * kDpm, margins.top() * kDpm);
+    FontCache fonts;
     if (pageIndex >= 0 && pageIndex < layout.pageCount())
         for (const ReportLayout::Placement& placement : layout.page(pageIndex).placements)
-            paintBand(painter, layout, placement, pageIndex);
+            paintBand(painter, layout, placement, pageIndex, fonts);
     painter.restore();
 }
 
