@@ -6,6 +6,7 @@
 #include "ui/report/ReportRenderer.h"
 #include "ui/rtf/RtfWriter.h"
 
+#include <QElapsedTimer>
 #include <QPdfWriter>
 #include <QTemporaryDir>
 #include <QTest>
@@ -217,6 +218,24 @@ private Q_SLOTS:
         const QString all = sheets.join(u'\n');
         for (int i = 1; i <= 140; ++i)
             QCOMPARE(linesEqual(all, QStringLiteral("Punkt %1 mit Umlauten äöü ß").arg(i)), 1);
+    }
+
+    void aHugeNoteStaysBounded()
+    {
+        // 10 MB of note text: laid out and paged without hanging; every page is filled.
+        QByteArray text;
+        text.reserve(10 * 1024 * 1024);
+        while (text.size() < 10 * 1024 * 1024)
+            text += "Zeile mit etwas Text, damit sie umbricht und die Seite füllt, äöü.\n";
+        ReportParameters p;
+        p.text.insert(QStringLiteral("KontaktBezeichnung"), QStringLiteral("Groß"));
+        p.rich.insert(QStringLiteral("NotizText"), text);
+        QElapsedTimer t;
+        t.start();
+        ReportLayout layout(definition("Notiz"), p, nullptr, kPrinted);
+        layout.layoutAll();
+        qInfo("10 MB note: %d pages in %lld ms", layout.pageCount(), t.elapsed());
+        QVERIFY(layout.pageCount() > 1000);
     }
 
     void unknownNamesFailBeforeAnythingIsPrinted_data()
