@@ -9,6 +9,8 @@
 #include <QPainter>
 #include <QPdfWriter>
 #include <QPrinter>
+#include <QGlyphRun>
+#include <QRawFont>
 #include <QTextDocument>
 
 #include <unordered_map>
@@ -55,24 +57,60 @@ void paintRich(QPainter& painter, const ReportLayout& layout, const ReportLayout
     painter.restore();
 }
 
-// Fonts and their metrics per item, made once per painted page rather than per cell.
+// Fonts, their metrics and the glyphs of the texts already drawn, per item: shaping a cell's
+// text is most of a long report's time, and most cells repeat (dates, times, directions).
 class FontCache {
 public:
+    struct Shaped {
+        QGlyphRun run; // empty when the font lacks a glyph: then drawText finds a fallback
+        double width = 0;
+    };
     struct Entry {
         QFont font;
         QFontMetricsF metrics;
+        QRawFont raw;
+        QHash<QString, Shaped> texts;
     };
-    const Entry& of(const ReportDefinition& definition, const ReportItem& item)
+
+    Entry& of(const ReportDefinition& definition, const ReportItem& item)
     {
         auto it = m_entries.find(&item);
         if (it == m_entries.end()) {
             const QFont font = fontOf(definition, item.font);
-            it = m_entries.emplace(&item, Entry{font, QFontMetricsF(font)}).first;
+            it = m_entries.emplace(&item, Entry{font, QFontMetricsF(font), QRawFont::fromFont(font), {}}).first;
         }
         return it->second;
     }
 
+    const Shaped& shape(Entry& entry, const QString& text)
+    {
+        if (auto found = entry.texts.constFind(text); found != entry.texts.cend())
+            return *found;
+        if (entry.texts.size() > kMaxTexts)
+            entry.texts.clear();
+        Shaped shaped;
+        const QList<quint32> glyphs = entry.raw.isValid() ? entry.raw.glyphIndexesForString(text) : QList<quint32>();
+        if (!glyphs.isEmpty() && !glyphs.contains(0u) && glyphs.size() == text.size()) {
+            const QList<QPointF> advances = entry.raw.advancesForGlyphIndexes(glyphs, QRawFont::KernedAdvances);
+            QList<QPointF> positions;
+            positions.reserve(glyphs.size());
+            double x = 0;
+            for (const QPointF& advance : advances) {
+                positions.append(QPointF(x, 0));
+                x += advance.x();
+            }
+            shaped.run.setRawFont(entry.raw);
+            shaped.run.setGlyphIndexes(glyphs);
+            shaped.run.setPositions(positions);
+            shaped.width = x;
+        } else {
+            shaped.width = entry.metrics.horizontalAdvance(text);
+        }
+        return *entry.texts.insert(text, shaped);
+    }
+
 private:
+    static constexpr qsizetype kMaxTexts = 20000;
     std::unordered_map<const ReportItem*, Entry> m_entries;
 };
 
@@ -90,18 +128,19 @@ void paintBand(QPainter& painter, const ReportLayout& layout, const ReportLayout
     for (const ReportItem& item : band.items) {
         switch (item.kind) {
         case ReportItem::Kind::Text: {
-            const FontCache::Entry& font = fonts.of(definition, item);
+            FontCache::Entry& font = fonts.of(definition, item);
             const QRectF box = dots(item.rect, placement.y);
             QString text = layout.expand(item.text, placement.row, pageIndex);
             if (text.isEmpty())
                 break;
             // Placed by hand rather than through drawText(rect, flags): the same result for one
-            // line, without a text layout per cell, which is most of a long report's time.
-            double width = font.metrics.horizontalAdvance(text);
-            if (width > box.width()) {
+            // line, without a text layout per cell.
+            const FontCache::Shaped* shaped = &fonts.shape(font, text);
+            if (shaped->width > box.width()) {
                 text = font.metrics.elidedText(text, Qt::ElideRight, box.width());
-                width = font.metrics.horizontalAdvance(text);
+                shaped = &fonts.shape(font, text);
             }
+            const double width = shaped->width;
             const Qt::Alignment h = item.align & Qt::AlignHorizontal_Mask;
             const double x = h == Qt::AlignRight ? box.right() - width
                 : h == Qt::AlignHCenter          ? box.left() + (box.width() - width) / 2
@@ -111,9 +150,14 @@ void paintBand(QPainter& painter, const ReportLayout& layout, const ReportLayout
             const double top = v == Qt::AlignTop ? box.top()
                 : v == Qt::AlignBottom           ? box.bottom() - lineHeight
                                                  : box.top() + (box.height() - lineHeight) / 2;
-            painter.setFont(font.font);
+            const QPointF baseline(x, top + font.metrics.ascent());
             painter.setPen(item.color);
-            painter.drawText(QPointF(x, top + font.metrics.ascent()), text);
+            if (!shaped->run.isEmpty()) {
+                painter.drawGlyphRun(baseline, shaped->run);
+            } else {
+                painter.setFont(font.font);
+                painter.drawText(baseline, text);
+            }
             break;
         }
         case ReportItem::Kind::RichText:
@@ -139,9 +183,7 @@ void paintBand(QPainter& painter, const ReportLayout& layout, const ReportLayout
     }
 }
 
-} // namespace
-
-void ReportRenderer::paintPage(QPainter& painter, const ReportLayout& layout, int pageIndex, const QRectF& target)
+void paintPageWith(QPainter& painter, const ReportLayout& layout, int pageIndex, const QRectF& target, FontCache& fonts)
 {
     const QSizeF paper = layout.paperDots();
     painter.save();
@@ -153,11 +195,18 @@ void ReportRenderer::paintPage(QPainter& painter, const ReportLayout& layout, in
     painter.setRenderHint(QPainter::TextAntialiasing);
     const QMarginsF& margins = layout.definition().margins;
     painter.translate(margins.left() * kDpm, margins.top() * kDpm);
-    FontCache fonts;
     if (pageIndex >= 0 && pageIndex < layout.pageCount())
         for (const ReportLayout::Placement& placement : layout.page(pageIndex).placements)
             paintBand(painter, layout, placement, pageIndex, fonts);
     painter.restore();
+}
+
+} // namespace
+
+void ReportRenderer::paintPage(QPainter& painter, const ReportLayout& layout, int pageIndex, const QRectF& target)
+{
+    FontCache fonts;
+    paintPageWith(painter, layout, pageIndex, target, fonts);
 }
 
 void ReportRenderer::print(QPagedPaintDevice* device, ReportLayout& layout, int from, int to, int copies)
@@ -178,6 +227,7 @@ void ReportRenderer::print(QPagedPaintDevice* device, ReportLayout& layout, int 
         throw AppException(QStringLiteral("Der Drucker oder die Datei nimmt den Bericht nicht an."));
     const double dpi = device->logicalDpiX();
     const QRectF target(0, 0, paper.width() / 25.4 * dpi, paper.height() / 25.4 * device->logicalDpiY());
+    FontCache fonts;
     bool first = true;
     for (int copy = 0; copy < copies; ++copy) {
         for (int page = from; page <= to; ++page) {
@@ -186,7 +236,7 @@ void ReportRenderer::print(QPagedPaintDevice* device, ReportLayout& layout, int 
                 throw AppException(QStringLiteral("Der Drucker hat den Auftrag abgebrochen (Seite %1).").arg(page));
             }
             first = false;
-            ReportRenderer::paintPage(painter, layout, page - 1, target);
+            paintPageWith(painter, layout, page - 1, target, fonts);
         }
     }
     if (!painter.end())
