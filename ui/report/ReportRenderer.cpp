@@ -13,6 +13,7 @@
 #include <QRawFont>
 #include <QTextDocument>
 
+#include <map>
 #include <unordered_map>
 
 namespace orvanta {
@@ -109,8 +110,38 @@ public:
         return *entry.texts.insert(text, shaped);
     }
 
+    // The glyphs of one page, gathered per font and colour and drawn in one run each: a PDF
+    // writer's cost is mostly per call, not per glyph.
+    void add(Entry& entry, const QColor& color, const Shaped& shaped, const QPointF& at)
+    {
+        Batch& batch = m_batches[{&entry, color.rgba()}];
+        batch.glyphs += shaped.run.glyphIndexes();
+        for (const QPointF& p : shaped.run.positions())
+            batch.positions.append(p + at);
+    }
+    void flush(QPainter& painter)
+    {
+        for (auto& [key, batch] : m_batches) {
+            if (batch.glyphs.isEmpty())
+                continue;
+            QGlyphRun run;
+            run.setRawFont(key.first->raw);
+            run.setGlyphIndexes(batch.glyphs);
+            run.setPositions(batch.positions);
+            painter.setPen(QColor::fromRgba(key.second));
+            painter.drawGlyphRun(QPointF(0, 0), run);
+            batch.glyphs.clear();
+            batch.positions.clear();
+        }
+    }
+
 private:
+    struct Batch {
+        QList<quint32> glyphs;
+        QList<QPointF> positions;
+    };
     static constexpr qsizetype kMaxTexts = 20000;
+    std::map<std::pair<Entry*, QRgb>, Batch> m_batches;
     std::unordered_map<const ReportItem*, Entry> m_entries;
 };
 
@@ -151,10 +182,10 @@ void paintBand(QPainter& painter, const ReportLayout& layout, const ReportLayout
                 : v == Qt::AlignBottom           ? box.bottom() - lineHeight
                                                  : box.top() + (box.height() - lineHeight) / 2;
             const QPointF baseline(x, top + font.metrics.ascent());
-            painter.setPen(item.color);
             if (!shaped->run.isEmpty()) {
-                painter.drawGlyphRun(baseline, shaped->run);
+                fonts.add(font, item.color, *shaped, baseline);
             } else {
+                painter.setPen(item.color);
                 painter.setFont(font.font);
                 painter.drawText(baseline, text);
             }
@@ -198,6 +229,7 @@ void paintPageWith(QPainter& painter, const ReportLayout& layout, int pageIndex,
     if (pageIndex >= 0 && pageIndex < layout.pageCount())
         for (const ReportLayout::Placement& placement : layout.page(pageIndex).placements)
             paintBand(painter, layout, placement, pageIndex, fonts);
+    fonts.flush(painter);
     painter.restore();
 }
 
