@@ -181,6 +181,23 @@ private Q_SLOTS:
         QVERIFY(!text.contains(QStringLiteral("Ort: ")));
     }
 
+    void oddValuesPrintAsTheyAre()
+    {
+        // A separator character inside a value, characters the report font lacks, an empty row.
+        MemorySource source({QStringLiteral("Name"), QStringLiteral("Ort"), QStringLiteral("Odd")},
+                            {{QStringLiteral("Vor\x1fNach"), QStringLiteral("Köln"), QStringLiteral("T")},
+                             {QStringLiteral("漢字 ☎ Anruf"), QStringLiteral("Köln"), QStringLiteral("F")},
+                             {QString(), QString(), QString()}});
+        ReportLayout layout(definition("Liste"), zeitraum(), &source, kPrinted);
+        QTemporaryDir dir;
+        const QString pdf = dir.filePath(QStringLiteral("odd.pdf"));
+        ReportRenderer::writePdf(pdf, layout);
+        const QString text = pdfText(pdf);
+        QVERIFY2(text.contains(QStringLiteral("Vor Nach")), qPrintable(text));
+        QVERIFY(text.contains(QStringLiteral("Anruf")));
+        QCOMPARE(text.count(QStringLiteral("Ort:")), 2); // "Köln" and the empty town
+    }
+
     void aNoteFlowsAcrossPages()
     {
         QTextDocument note;

@@ -26,6 +26,8 @@ QPaintDevice* layoutDevice()
     return &device;
 }
 
+constexpr QChar kUnit(0x1F); // the unit separator between a row's values
+
 const QString kPage = QStringLiteral("Seite");
 const QString kPages = QStringLiteral("Seiten");
 const QString kDate = QStringLiteral("Druckdatum");
@@ -164,7 +166,7 @@ bool ReportLayout::isShaded(const ReportBand& band, int row) const
     if (band.shadeField.isEmpty() || row < 0 || row >= m_rows.size())
         return false;
     const int field = m_fieldIndex.value(band.shadeField, -1);
-    return field >= 0 && m_rows[row].value(field) == u"T";
+    return field >= 0 && value(row, field) == u"T";
 }
 
 QString ReportLayout::expand(const QString& templ, int row, int pageIndex) const
@@ -181,7 +183,7 @@ QString ReportLayout::expand(const QString& templ, int row, int pageIndex) const
         literal(open);
         copied = close + 1;
         if (const auto field = m_fieldIndex.constFind(name); field != m_fieldIndex.cend())
-            out += (row >= 0 && row < m_rows.size()) ? m_rows[row].value(*field) : QString();
+            out += value(row, *field);
         else if (const auto param = m_parameters.text.constFind(name); param != m_parameters.text.cend())
             out += *param;
         else if (name == kPage)
@@ -195,6 +197,24 @@ QString ReportLayout::expand(const QString& templ, int row, int pageIndex) const
     });
     literal(templ.size());
     return out;
+}
+
+QStringView ReportLayout::value(int row, int field) const
+{
+    if (row < 0 || row >= m_rows.size() || field < 0)
+        return {};
+    const QString& all = m_rows[row];
+    qsizetype from = 0;
+    for (int i = 0; i < field; ++i) {
+        from = all.indexOf(kUnit, from);
+        if (from < 0)
+            return {};
+        ++from;
+    }
+    qsizetype to = all.indexOf(kUnit, from);
+    if (to < 0)
+        to = all.size();
+    return QStringView(all).sliced(from, to - from);
 }
 
 double ReportLayout::bottom() const
@@ -321,13 +341,15 @@ void ReportLayout::step()
             return;
         }
         const int index = int(m_rows.size());
-        m_rows.append(m_source->row());
+        QStringList values = m_source->row();
+        for (QString& v : values)
+            v.replace(kUnit, u' ');
+        m_rows.append(values.join(kUnit));
         m_source->next();
-        const QStringList& row = m_rows.last();
         qsizetype changed = m_lastRow < 0 ? 0 : m_levels.size();
         if (m_lastRow >= 0) {
             for (qsizetype i = 0; i < m_levels.size(); ++i) {
-                if (m_rows[m_lastRow].value(m_levels[i].field) != row.value(m_levels[i].field)) {
+                if (value(m_lastRow, m_levels[i].field) != value(index, m_levels[i].field)) {
                     changed = i;
                     break;
                 }

@@ -97,7 +97,10 @@ private:
     QHash<const ReportItem*, std::shared_ptr<QTextDocument>> m_rich;
 
     mutable int m_richBlock = 0; // where the rich text's next page break is searched from
-    QList<QStringList> m_rows;
+    // Every row's values in one string, separated by kUnit: a long report holds its rows, and
+    // one string per row costs a fraction of a list of strings.
+    QList<QString> m_rows;
+    [[nodiscard]] QStringView value(int row, int field) const;
     QList<Page> m_pages;
     double m_y = 0;
     double m_contentTop = 0; // below the page header: a page with nothing further is empty
