@@ -8,6 +8,7 @@
 #include "tests/contacts/ContactTestEnv.h"
 #include "tests/TestPaths.h"
 #include "tests/support/TestRegistry.h"
+#include "tests/support/TypeKeys.h"
 #include "ui/rtf/RtfText.h"
 
 #include <QAction>
@@ -28,20 +29,10 @@
 #include <vector>
 
 using namespace orvanta;
+using orvanta::test::typeKeys;
 using orvanta::test::ContactTestEnv;
 
 namespace {
-
-// Types text key by key as the user would (QTest's key clicks take ASCII only).
-void typeKeys(QWidget* w, const QString& text)
-{
-    for (const QChar c : text) {
-        QKeyEvent press(QEvent::KeyPress, 0, Qt::NoModifier, QString(c));
-        QApplication::sendEvent(w, &press);
-        QKeyEvent release(QEvent::KeyRelease, 0, Qt::NoModifier, QString(c));
-        QApplication::sendEvent(w, &release);
-    }
-}
 
 // The main window's part in the dialogue: it keeps the records and saves them on WMSAVECONDATA
 // into the test's database, telling the window when that failed.

@@ -1,5 +1,6 @@
 #include "contacts/EntryEditors.h"
 #include "tests/support/TestRegistry.h"
+#include "tests/support/TypeKeys.h"
 
 #include <QAction>
 #include <QApplication>
@@ -11,19 +12,9 @@
 #include <QTimer>
 
 using namespace orvanta;
+using orvanta::test::typeKeys;
 
 namespace {
-
-// Types text key by key as the user would (QTest's key clicks take ASCII only).
-void typeKeys(QWidget* w, const QString& text)
-{
-    for (const QChar c : text) {
-        QKeyEvent press(QEvent::KeyPress, 0, Qt::NoModifier, QString(c));
-        QApplication::sendEvent(w, &press);
-        QKeyEvent release(QEvent::KeyRelease, 0, Qt::NoModifier, QString(c));
-        QApplication::sendEvent(w, &release);
-    }
-}
 
 QLineEdit* edit(const QWidget& w, const char* name)
 {
