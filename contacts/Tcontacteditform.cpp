@@ -32,6 +32,7 @@
 #include <QLineEdit>
 #include <QMainWindow>
 #include <QMenu>
+#include <QPainter>
 #include <QPushButton>
 #include <QRegularExpression>
 #include <QSaveFile>
@@ -122,6 +123,7 @@ QTableWidget* makeGrid(QWidget* parent, const char* name, const QStringList& hea
     grid->setSelectionBehavior(QAbstractItemView::SelectRows);
     grid->setSelectionMode(QAbstractItemView::SingleSelection);
     grid->verticalHeader()->hide();
+    grid->setWordWrap(false);
     grid->horizontalHeader()->setSectionResizeMode(QHeaderView::Interactive);
     grid->horizontalHeader()->setDefaultAlignment(Qt::AlignCenter);
     for (int i = 0; i < widths.size(); ++i)
@@ -170,6 +172,70 @@ constexpr ColorEntry kColors[] = {
     {"Silber", 0xC0C0C0},  {"Rot", 0xFF0000},            {"Hellgrün", 0x00FF00}, {"Gelb", 0xFFFF00},
     {"Blau", 0x0000FF},    {"Fuchsia", 0xFF00FF},        {"Aqua", 0x00FFFF},     {"Weiß", 0xFFFFFF},
 };
+
+// Small drawn icons for the note tool bar, so that it needs no icon theme.
+QIcon drawnIcon(const std::function<void(QPainter&)>& draw)
+{
+    QPixmap pm(16, 16);
+    pm.fill(Qt::transparent);
+    QPainter p(&pm);
+    p.setRenderHint(QPainter::Antialiasing);
+    p.setPen(QPen(QColor(40, 40, 40), 1));
+    draw(p);
+    return QIcon(pm);
+}
+
+QIcon letterIcon(const QString& letter, int styleBit)
+{
+    return drawnIcon([&](QPainter& p) {
+        QFont f(QStringLiteral("Serif"));
+        f.setPixelSize(13);
+        f.setBold(styleBit == 1);
+        f.setItalic(styleBit == 2);
+        f.setUnderline(styleBit == 4);
+        f.setStrikeOut(styleBit == 8);
+        p.setFont(f);
+        p.drawText(QRect(0, 0, 16, 16), Qt::AlignCenter, letter);
+    });
+}
+
+QIcon alignIcon(int tag)
+{
+    return drawnIcon([tag](QPainter& p) {
+        const int widths[] = {12, 8, 12, 6};
+        for (int i = 0; i < 4; ++i) {
+            const int w = widths[i];
+            const int x = tag == 0 ? 2 : tag == 1 ? 14 - w : 8 - w / 2;
+            p.drawLine(x, 3 + i * 3, x + w, 3 + i * 3);
+        }
+    });
+}
+
+QIcon bulletIcon()
+{
+    return drawnIcon([](QPainter& p) {
+        p.setBrush(QColor(40, 40, 40));
+        for (int i = 0; i < 3; ++i) {
+            p.drawEllipse(QPointF(3.5, 3.5 + i * 4.5), 1.3, 1.3);
+            p.drawLine(7, 4 + i * 4, 14, 4 + i * 4);
+        }
+    });
+}
+
+QIcon copyIcon(bool paste)
+{
+    return drawnIcon([paste](QPainter& p) {
+        p.setBrush(Qt::white);
+        if (paste) {
+            p.drawRect(2, 3, 10, 12);
+            p.drawRect(5, 1, 4, 3);
+            p.drawRect(7, 7, 7, 8);
+        } else {
+            p.drawRect(2, 2, 8, 9);
+            p.drawRect(6, 5, 8, 9);
+        }
+    });
+}
 
 } // namespace
 
@@ -473,7 +539,8 @@ QWidget* Tcontacteditform::buildNotesTab()
     layout->setContentsMargins(0, 0, 0, 0);
     // The tool bars live in a window of their own inside the tab, so that they can be arranged
     // and the arrangement stored like the main window's.
-    m_barHost = new QMainWindow(page, Qt::Widget);
+    m_barHost = new QMainWindow(page);
+    m_barHost->setWindowFlags(Qt::Widget); // the constructor always makes a window of it
     m_barHost->setObjectName(QStringLiteral("NoteBarHost"));
     m_notiz1 = new QTextEdit(m_barHost);
     m_notiz1->setObjectName(QStringLiteral("Notiz1"));
@@ -520,9 +587,10 @@ void Tcontacteditform::buildNoteToolBar(QMainWindow* host)
             this, &Tcontacteditform::printNote);
 
     QToolBar* clip = bar("dxBarCopy", "Kopieren");
-    connect(item(clip, "dxBB4", "Ausschneiden"), &QAction::triggered, m_notiz1, &QTextEdit::cut);
-    connect(item(clip, "dxBB5", "Kopieren"), &QAction::triggered, m_notiz1, &QTextEdit::copy);
-    connect(item(clip, "dxBB6", "Einfügen"), &QAction::triggered, m_notiz1, &QTextEdit::paste);
+    connect(item(clip, "dxBB4", "Ausschneiden", letterIcon(QStringLiteral("\u2702"), 0)), &QAction::triggered,
+            m_notiz1, &QTextEdit::cut);
+    connect(item(clip, "dxBB5", "Kopieren", copyIcon(false)), &QAction::triggered, m_notiz1, &QTextEdit::copy);
+    connect(item(clip, "dxBB6", "Einfügen", copyIcon(true)), &QAction::triggered, m_notiz1, &QTextEdit::paste);
 
     QToolBar* format = bar("dxBarFormat", "Textformatierung");
     const struct {
@@ -533,8 +601,8 @@ void Tcontacteditform::buildNoteToolBar(QMainWindow* host)
     } styles[] = {{"dxBB7", "Fett", "F", 1}, {"dxBB8", "Kursiv", "K", 2}, {"dxBB9", "Unterstrichen", "U", 4},
                   {"dxBB10", "Durchgestrichen", "S", 8}};
     for (int i = 0; i < 4; ++i) {
-        QAction* a = item(format, styles[i].name, styles[i].caption);
-        a->setIconText(QString::fromUtf8(styles[i].glyph));
+        QAction* a = item(format, styles[i].name, styles[i].caption,
+                          letterIcon(QString::fromUtf8(styles[i].glyph), styles[i].bit));
         a->setCheckable(true);
         const int bit = styles[i].bit;
         connect(a, &QAction::toggled, this, [this, bit](bool on) { setStyleBit(bit, on); });
@@ -550,7 +618,7 @@ void Tcontacteditform::buildNoteToolBar(QMainWindow* host)
         int tag;
     } aligns[] = {{"dxBB11", "Linksbündig", 0}, {"dxBB12", "Zentriert", 2}, {"dxBB13", "Rechtsbündig", 1}};
     for (const auto& a : aligns) {
-        QAction* action = item(align, a.name, a.caption);
+        QAction* action = item(align, a.name, a.caption, alignIcon(a.tag));
         action->setCheckable(true);
         action->setData(a.tag);
         m_align->addAction(action);
@@ -558,8 +626,9 @@ void Tcontacteditform::buildNoteToolBar(QMainWindow* host)
         connect(action, &QAction::triggered, this, [this, tag] { setAlignment(tag); });
     }
 
+    host->addToolBarBreak(Qt::TopToolBarArea);
     QToolBar* list = bar("dxBarList", "Aufzählung");
-    m_bullets = item(list, "dxBB14", "Aufzählung");
+    m_bullets = item(list, "dxBB14", "Aufzählung", bulletIcon());
     m_bullets->setCheckable(true);
     connect(m_bullets, &QAction::toggled, this, &Tcontacteditform::setBullets);
 
@@ -567,6 +636,7 @@ void Tcontacteditform::buildNoteToolBar(QMainWindow* host)
     m_fontName = new QFontComboBox(font);
     m_fontName->setObjectName(QStringLiteral("dxBFNC1"));
     m_fontName->setToolTip(QStringLiteral("Schriftart"));
+    m_fontName->setMaximumWidth(170);
     font->addWidget(m_fontName);
     connect(m_fontName, &QFontComboBox::currentFontChanged, this,
             [this](const QFont& f) { setFontName(f.family()); });

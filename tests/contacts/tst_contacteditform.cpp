@@ -19,6 +19,8 @@
 #include <QPointer>
 #include <QPushButton>
 #include <QTableWidget>
+#include <QTabWidget>
+#include <QToolBar>
 #include <QTest>
 #include <QTextCursor>
 #include <QTextEdit>
@@ -324,6 +326,11 @@ private Q_SLOTS:
         host.open();
         type(host.edit("RzEdit3"), QStringLiteral("Notiz"));
         QTextEdit* note = host.form->noteEditor();
+        host.form->findChild<QTabWidget*>(QStringLiteral("AdvPageControl1"))->setCurrentIndex(3);
+        QVERIFY(note->isVisible());
+        QCOMPARE(host.form->findChildren<QToolBar*>().size(), 6);
+        for (QToolBar* tb : host.form->findChildren<QToolBar*>())
+            QVERIFY(tb->isVisible());
         QTextCursor c(note->document());
         QTextCharFormat bold;
         bold.setFontWeight(QFont::Bold);
