@@ -1,3 +1,4 @@
+#include "app/ContactEditFeature.h"
 #include "app/MainWindowFeatures.h"
 #include "app/TLogform.h"
 #include "calllog/Tlogframe.h"
@@ -160,6 +161,13 @@ private Q_SLOTS:
         QCOMPARE(env.db().scalar(QStringLiteral("SELECT CONTBEZ FROM CONTACT WHERE LID = 5")).toString(),
                  QStringLiteral("Bernd, Ernie"));
         QCOMPARE(list->GetSelectedLID(), 5);
+
+        // The category manager's changes reach the open window of the contact.
+        ChangeRelatedKontKat(w, 5, QStringLiteral("Freunde"));
+        QCOMPARE(bernd->findChild<QLineEdit*>(QStringLiteral("RzButtonEdit1"))->text(), QStringLiteral("Freunde"));
+        HasRenameKatBez(w, QStringLiteral("Freunde"), QStringLiteral("Gute Freunde"));
+        QCOMPARE(bernd->findChild<QLineEdit*>(QStringLiteral("RzButtonEdit1"))->text(), QStringLiteral("Gute Freunde"));
+        QVERIFY(!bernd->Modified());
 
         // Closing the main window with an edit window open frees it with everything else.
         QPointer<Tcontacteditform> open = bernd;

@@ -20,6 +20,8 @@
 #include <QPushButton>
 #include <QTableWidget>
 #include <QTabWidget>
+#include <QToolButton>
+#include <QFile>
 #include <QToolBar>
 #include <QTest>
 #include <QTextCursor>
@@ -405,6 +407,107 @@ private Q_SLOTS:
         QVERIFY(host.form->salutationHistory().isEmpty());
         host.form->close();
         QTRY_COMPARE(closeMessages(env), 2);
+    }
+
+    void categoryPrintAndNoteFilesGoThroughTheirSeams()
+    {
+        ContactTestEnv env;
+        env.add(5, QStringLiteral("Huber"), {}, QStringLiteral("Kunden"));
+        Host host(env);
+        host.open(5);
+        QCOMPARE(host.edit("RzButtonEdit1")->text(), QStringLiteral("Kunden"));
+        // Taken over from the category manager without counting as the user's change.
+        host.form->KatHasChanged(QStringLiteral("Stammkunden"));
+        QCOMPARE(host.edit("RzButtonEdit1")->text(), QStringLiteral("Stammkunden"));
+        QCOMPARE(host.record().KATBEZ(), QStringLiteral("Stammkunden"));
+        QVERIFY(!host.form->Modified());
+        // Picking one is the user's change.
+        auto* pick = host.form->findChild<QToolButton*>(QStringLiteral("RzButtonEdit1Button"));
+        pick->click(); // no category manager installed: nothing happens
+        QVERIFY(!host.form->Modified());
+        Tcontacteditform::setCategoryPicker([](QWidget*) { return QStringLiteral("Lieferanten"); });
+        pick->click();
+        Tcontacteditform::setCategoryPicker({});
+        QCOMPARE(host.edit("RzButtonEdit1")->text(), QStringLiteral("Lieferanten"));
+        QVERIFY(host.form->Modified());
+
+        // Printing needs a designation; a failing report is written to the error log.
+        host.edit("RzEdit9")->clear();
+        host.action("dxBB3")->trigger();
+        QCOMPARE(env.dialogs().last().text, QStringLiteral("Bitte geben Sie erst eine Kontaktbezeichnung ein."));
+        QCOMPARE(env.dialogs().last().kind, DialogKind::Warning);
+        host.edit("RzEdit9")->setText(QStringLiteral("Huber"));
+        host.form->noteEditor()->setPlainText(QStringLiteral("Rückruf"));
+        QString printed;
+        QByteArray rtf;
+        Tcontacteditform::setNotePrinter([&](const QString& designation, const QByteArray& content) {
+            printed = designation;
+            rtf = content;
+            return NotePrintResult{QStringLiteral("NO_REPORT_ASSIGNED"), 7, QStringLiteral("kein Bericht")};
+        });
+        host.action("dxBB3")->trigger();
+        Tcontacteditform::setNotePrinter({});
+        QCOMPARE(printed, QStringLiteral("Huber"));
+        QVERIFY(rtf.startsWith("{\\rtf1"));
+        QCOMPARE(env.dialogs().last().text, QStringLiteral("Methode: NotizDruck\r\nError: NO_REPORT_ASSIGNED\r\n"
+                                                           "Error-Number: 7\r\nkein Bericht"));
+        QVERIFY(env.errorLogText().contains(QStringLiteral("Error-Number: 7")));
+
+        // Saving asks before overwriting; opening reads rich or plain text.
+        const QString path = env.file(QStringLiteral("notiz.rtf"));
+        QList<bool> asked;
+        Tcontacteditform::setFileChooser([&](QWidget*, bool save, const QString&, const QString& filter) {
+            asked.append(save);
+            [&] { QCOMPARE(filter, QStringLiteral("Richtext (*.rtf);;Text (*.txt)")); }();
+            return path;
+        });
+        host.action("dxBB2")->trigger();
+        QVERIFY(QFile::exists(path));
+        host.form->noteEditor()->setPlainText(QStringLiteral("anders"));
+        env.dialogs().enqueueAnswer(DialogButton::No);
+        host.action("dxBB2")->trigger();
+        QCOMPARE(env.dialogs().last().text, QStringLiteral("Überschreiben?"));
+        host.action("dxBB1")->trigger();
+        Tcontacteditform::setFileChooser({});
+        QCOMPARE(asked, (QList<bool>{true, true, false}));
+        QCOMPARE(host.form->noteEditor()->toPlainText(), QStringLiteral("Rückruf"));
+    }
+
+    void fieldsFollowInTabOrder()
+    {
+        ContactTestEnv env;
+        Host host(env);
+        host.open();
+        QStringList order;
+        QWidget* w = host.form->findChild<QComboBox*>(QStringLiteral("RzMRUCB1"));
+        for (int i = 0; i < 11 && w; ++i) {
+            order << w->objectName();
+            do
+                w = w->nextInFocusChain();
+            while (w && ((w->focusPolicy() & Qt::TabFocus) != Qt::TabFocus || w->objectName().isEmpty()));
+        }
+        QCOMPARE(order, (QStringList{QStringLiteral("RzMRUCB1"), QStringLiteral("RzEdit2"), QStringLiteral("RzEdit3"),
+                                     QStringLiteral("RzEdit1"), QStringLiteral("RzEdit4"), QStringLiteral("RzEdit9"),
+                                     QStringLiteral("RzBitBtn1"), QStringLiteral("RzEdit10"), QStringLiteral("RzEdit11"),
+                                     QStringLiteral("RzButtonEdit1"), QStringLiteral("RzButtonEdit1Button")}));
+    }
+
+    void aTenMegabyteNoteIsStoredAndReadBack()
+    {
+        ContactTestEnv env;
+        TvkMiniKontakt r;
+        r.setNAME(QStringLiteral("Viel"));
+        QByteArray note = "{\\rtf1\\ansi ";
+        while (note.size() < 10 * 1024 * 1024)
+            note += "Zeile mit Text \\'e4\\'f6\\'fc\\par\r\n";
+        note += "}";
+        r.StoreNotes(note, QStringLiteral("x"));
+        QVERIFY(InsertConData(env.dm(), &r));
+        QCOMPARE(r.notes(), note);
+        Host host(env);
+        host.open(r.LID());
+        QVERIFY(host.form->noteEditor()->toPlainText().startsWith(QStringLiteral("Zeile mit Text äöü")));
+        QVERIFY(!host.form->DataError());
     }
 
 private:
