@@ -95,6 +95,43 @@ private Q_SLOTS:
         QVERIFY(w.contactRecords().allFree());
     }
 
+    void aSaveThatBreaksOffHalfWayLeavesNoContactAndKeepsTheWindow()
+    {
+        AppTestEnv env;
+        env.addCall(17, QStringLiteral("2024-05-15"), QStringLiteral("0891234567"), QStringLiteral("0891234567"));
+        // The database gives up after the contact row and the caller's number, at the second number.
+        env.db().exec(QStringLiteral("CREATE EXCEPTION E_GONE 'Verbindung abgebrochen';\n"
+                                     "SET TERM ^ ;\n"
+                                     "CREATE TRIGGER T_GONE FOR COM BEFORE INSERT AS BEGIN\n"
+                                     "  IF (NEW.KOMMBEZ = 'Zweite') THEN EXCEPTION E_GONE;\n"
+                                     "END^\n"
+                                     "SET TERM ; ^\n"));
+        TLogform& w = env.window({}, defaultMainWindowFeatures());
+        w.show();
+        sendMessage(&w, WMCONTACTDATAFROMSCREEN, 17, 0);
+        Tcontacteditform* form = editWindow(w, 0);
+        QVERIFY(form);
+        TvkMiniKontakt* record = w.contactRecords().at(form->DataIndex());
+        TvkKommItem second;
+        second.KOMMBEZ = QStringLiteral("Zweite");
+        second.NUMBER = QStringLiteral("555");
+        second.status = EntryStatus::New;
+        record->AddKD(second);
+        typeInto(form, "RzEdit3", QStringLiteral("Halb"));
+        act(*form, "conedit_ok")->trigger();
+        QVERIFY(env.dialogs().last().text.startsWith(QStringLiteral("# Orvanta - InsertConData\r\n")));
+        QCOMPARE(env.db().scalar(QStringLiteral("SELECT COUNT(*) FROM CONTACT")).toInt(), 0);
+        QCOMPARE(env.db().scalar(QStringLiteral("SELECT COUNT(*) FROM COM")).toInt(), 0);
+        QCOMPARE(env.db().scalar(QStringLiteral("SELECT CID FROM LOG WHERE LID = 17")).toInt(), 0);
+        QVERIFY(form->isVisible());
+        QVERIFY(form->SaveLocked());
+        QVERIFY(!act(*form, "conedit_ok")->isEnabled());
+        QVERIFY(!act(*form, "conedit_uebern")->isEnabled());
+        QCOMPARE(form->findChild<QLineEdit*>(QStringLiteral("RzEdit3"))->text(), QStringLiteral("Halb"));
+        QCOMPARE(record->KD().size(), 2);
+        QCOMPARE(record->LID(), 0);
+    }
+
     void answeringNoLeavesTheLogUntilTheCallerIsOfferedAgain()
     {
         AppTestEnv env;
