@@ -8,35 +8,24 @@
 // The main window sets, before showing it, the properties "tag" (its slot), "recordSlot"
 // (DataIndex), "existingContact" (EditMode 1), "callerNumber" (NewNumber) and "saveFailed".
 
+#include "contacts/ContactNoteEditor.h"
+
 #include <QWidget>
 
 #include <functional>
 
 class QAction;
-class QActionGroup;
 class QComboBox;
-class QFontComboBox;
 class QLabel;
 class QLineEdit;
-class QMainWindow;
 class QPushButton;
-class QSpinBox;
 class QTableWidget;
 class QTabWidget;
 class QTextEdit;
-class QToolButton;
 
 namespace orvanta {
 
 class TvkMiniKontakt;
-
-// What printing a note reported: code "OK" on success, else the report's result code name with
-// its error number and message.
-struct NotePrintResult {
-    QString code = QStringLiteral("OK");
-    int number = 0;
-    QString message;
-};
 
 class Tcontacteditform final : public QWidget {
     Q_OBJECT
@@ -56,13 +45,13 @@ public:
 
     // Installed by the program; until then "Drucken" prints nothing, the category button opens
     // nothing and the note's open/save dialogs are the standard ones.
-    using NotePrinter = std::function<NotePrintResult(const QString& designation, const QByteArray& rtf)>;
+    using NotePrinter = ContactNoteEditor::NotePrinter;
     static void setNotePrinter(NotePrinter printer);
     // The category manager in its pick mode: the chosen designation, empty when none was chosen.
     using CategoryPicker = std::function<QString(QWidget* parent)>;
     static void setCategoryPicker(CategoryPicker picker);
     // A file for "Öffnen" (save false) or "Speichern"; empty when cancelled.
-    using FileChooser = std::function<QString(QWidget* parent, bool save, const QString& folder, const QString& filter)>;
+    using FileChooser = ContactNoteEditor::FileChooser;
     static void setFileChooser(FileChooser chooser);
 
     // The monitor's country (AC: 1 Germany, 2 Austria, 3 Switzerland) for numbers without prefix.
@@ -98,8 +87,6 @@ public:
     void EditMailData();
     void DelMailData();
 
-    // The note tool bar's view of the selection.
-    void RichEditSelectionChange();
     [[nodiscard]] QTextEdit* noteEditor() const { return m_notiz1; }
     [[nodiscard]] QStringList salutationHistory() const { return m_history; }
 
@@ -116,7 +103,6 @@ private:
     QWidget* buildAddressTab();
     QWidget* buildCommunicationTab();
     QWidget* buildNotesTab();
-    void buildNoteToolBar(QMainWindow* host);
     QLineEdit* addEdit(QWidget* page, const char* name, int maxLength);
 
     void FormShow();
@@ -149,18 +135,6 @@ private:
     void saveHistory();
     void fillSalutationBox();
     void removeFromHistory();
-    void loadBars();
-    void saveBars();
-
-    void openNote();
-    void saveNote();
-    void printNote();
-    void setStyleBit(int bit, bool on);
-    void setAlignment(int tag);
-    void setBullets(bool on);
-    void setFontName(const QString& name);
-    void setFontSize(int size);
-    void setFontColor(int index);
 
     QObject* m_main;
     RecordLookup m_records;
@@ -173,7 +147,6 @@ private:
     bool m_modified = false;
     bool m_initialising = true;
     bool m_dataError = false;
-    bool m_toolbarUpdating = false;
     bool m_shown = false;
     bool m_closed = false;
     QStringList m_history;
@@ -198,13 +171,7 @@ private:
     QTableWidget* m_sg1 = nullptr;
     QTableWidget* m_mailGrid = nullptr;
     QTextEdit* m_notiz1 = nullptr;
-    QMainWindow* m_barHost = nullptr;
-    QAction* m_style[4] = {};      // dxBB7..dxBB10
-    QActionGroup* m_align = nullptr; // dxBB11..dxBB13
-    QAction* m_bullets = nullptr;  // dxBB14
-    QFontComboBox* m_fontName = nullptr; // dxBFNC1
-    QSpinBox* m_fontSize = nullptr;      // dxBSE1
-    QComboBox* m_fontColor = nullptr;    // dxBCC1
+    ContactNoteEditor* m_notes = nullptr;
     QAction* m_ok = nullptr;       // conedit_ok
     QAction* m_uebern = nullptr;   // conedit_uebern
     QAction* m_exit = nullptr;     // conedit_exit
