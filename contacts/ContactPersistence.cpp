@@ -110,6 +110,19 @@ QString matchingLabel(const TvkMiniKontakt& r, const QString& callerNumber)
     return {};
 }
 
+// A stored record that could not be reloaded: it must not send its entries a second time (deleted
+// ones stay hidden; sending them again deletes nothing more).
+void markSaved(TvkMiniKontakt& r, int key)
+{
+    r.setLID(key);
+    for (int i = 0; i < r.KD().size(); ++i)
+        if (r.KD().at(i).status != EntryStatus::Deleted)
+            r.setKDStatus(i, EntryStatus::Unchanged);
+    for (int i = 0; i < r.Mail().size(); ++i)
+        if (r.Mail().at(i).status != EntryStatus::Deleted)
+            r.setMailStatus(i, EntryStatus::Unchanged);
+}
+
 } // namespace
 
 bool GetDSID_Data(TDM2& dm, TvkMiniKontakt* record, int lid)
@@ -240,14 +253,8 @@ bool InsertConData(TDM2& dm, TvkMiniKontakt* record, const QString& callerNumber
         BusyCursor::resetCursor();
         relink(callerNumber, label, newKey, contbez);
     }
-    if (!GetDSID_Data(dm, record, newKey)) {
-        // Stored all the same: the window must not store it a second time as new.
-        record->setLID(newKey);
-        for (int i = 0; i < record->KD().size(); ++i)
-            record->setKDStatus(i, EntryStatus::Unchanged);
-        for (int i = 0; i < record->Mail().size(); ++i)
-            record->setMailStatus(i, EntryStatus::Unchanged);
-    }
+    if (!GetDSID_Data(dm, record, newKey))
+        markSaved(*record, newKey);
     return true;
 }
 
@@ -288,7 +295,8 @@ bool EditConData(TDM2& dm, TvkMiniKontakt* record)
                                               "aufgetreten!") + kCancelled);
         return false;
     }
-    GetDSID_Data(dm, record, key);
+    if (!GetDSID_Data(dm, record, key))
+        markSaved(*record, key);
     return true;
 }
 
