@@ -498,8 +498,10 @@ private Q_SLOTS:
         TvkMiniKontakt r;
         r.setNAME(QStringLiteral("Viel"));
         QByteArray note = "{\\rtf1\\ansi ";
+        // Long paragraphs: the size is the point, not the number of lines.
+        const QByteArray paragraph = QByteArray("Zeile mit Text \\'e4\\'f6\\'fc ").repeated(100) + "\\par\r\n";
         while (note.size() < 10 * 1024 * 1024)
-            note += "Zeile mit Text \\'e4\\'f6\\'fc\\par\r\n";
+            note += paragraph;
         note += "}";
         r.StoreNotes(note, QStringLiteral("x"));
         QVERIFY(InsertConData(env.dm(), &r));
