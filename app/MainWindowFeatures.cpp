@@ -1,6 +1,7 @@
 #include "app/MainWindowFeatures.h"
 
 #include "app/CallLogFeature.h"
+#include "app/ContactEditFeature.h"
 #include "app/ContactsFeature.h"
 #include "app/ExportFeature.h"
 
@@ -9,7 +10,7 @@ namespace orvanta {
 std::vector<MainWindowFeature> defaultMainWindowFeatures()
 {
     // A view whose frame no feature provides shows an empty frame.
-    return {registerCallLogFeature, registerContactsFeature, registerExportFeature};
+    return {registerCallLogFeature, registerContactsFeature, registerContactEditFeature, registerExportFeature};
 }
 
 } // namespace orvanta

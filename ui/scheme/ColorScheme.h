@@ -59,4 +59,14 @@ struct DetailWindowColors {
 
 [[nodiscard]] const DetailWindowColors& detailWindowColors(int scheme);
 
+// The number and e-mail editors' colours.
+struct EditorDialogColors {
+    QColor panel;
+    QColor border;          // panel border, edit and check-box frames
+    QColor buttonHighlight;
+    QColor headerStart;     // header band gradient start
+};
+
+[[nodiscard]] const EditorDialogColors& editorDialogColors(int scheme);
+
 } // namespace orvanta
