@@ -157,6 +157,30 @@ private Q_SLOTS:
         f.DBDisconnect();
     }
 
+    // Switching views shows the rows already read (no second read of the address book); a
+    // refresh reads what changed meanwhile, in either view.
+    void switchingKeepsTheRowsRefreshRereads()
+    {
+        ContactTestEnv env;
+        fill(env);
+        Tcontactlistframe f(&env.dm());
+        QVERIFY(f.DBConnect(&env.host()));
+        env.add(6, QStringLiteral("Neu"));
+        QVERIFY(f.ChangeView(Tcontactlistframe::CardView));
+        QVERIFY(env.dm().ibcds_card.isActive());
+        QVERIFY(!env.dm().ibcds_list.isActive());
+        QCOMPARE(f.controller()->recordCount(), 5);
+        f.Refresh_View(6);
+        QCOMPARE(f.controller()->recordCount(), 6);
+        QCOMPARE(f.GetSelectedLID(), 6);
+        QCOMPARE(cardLine(f, 6, "Name"), QStringLiteral("Neu"));
+        QVERIFY(f.ChangeView(Tcontactlistframe::TableView));
+        QCOMPARE(designations(f.controller()), (QStringList{"Anna", "mahler", "Meier, Eva", "Müller GmbH", "Neu", "Zeta"}));
+        QCOMPARE(f.GetSelectedLID(), 6);
+        QCOMPARE(f.footerText(), QStringLiteral(" Kontakte: 6"));
+        f.DBDisconnect();
+    }
+
     // The computed rows read the database's nulls as empty: no trailing or leading blanks.
     void computedRowsOfRealContacts()
     {
