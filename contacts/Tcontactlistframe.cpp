@@ -514,8 +514,9 @@ void Tcontactlistframe::restoreLayout(int viewKind)
         GridController* g = m_cards->controller();
         if (g->sortedColumns().empty() && m_cards->captionColumn() >= 0)
             g->setSortOrder(m_cards->captionColumn(), GridSortOrder::Ascending);
-    } else
+    } else {
         m_layouts->restore(*m_view->controller(), TableView);
+    }
 }
 
 GridFilter Tcontactlistframe::filterForView(const GridFilter& filter, const GridController& from,
