@@ -33,6 +33,7 @@
 #include <QLinearGradient>
 #include <QMenu>
 #include <QPainter>
+#include <QScopedValueRollback>
 #include <QScrollArea>
 #include <QSplitter>
 #include <QStyle>
@@ -150,7 +151,7 @@ void Tcontactlistframe::connectView(GridViewBase* view)
 {
     const auto active = [this, view] { return view == activeGrid(); };
     connect(view, &GridViewBase::focusedRecordChanged, this, [this, active] {
-        if (active())
+        if (active() && !m_changingView)
             FocusedRecordChanged();
     });
     connect(view->controller(), &GridController::layoutChanged, this, [this, active] {
@@ -702,6 +703,8 @@ bool Tcontactlistframe::ChangeView(int kind)
     m_t1->stop();
     BusyCursor busy;
     const int focusedLid = m_dm ? m_dm->SelectedLID : -1;
+    // The views announce their focus on the way; the summary is built once, at the end.
+    const QScopedValueRollback<bool> changing(m_changingView, true);
     try {
         GridViewBase* oldView = activeGrid();
         GridViewBase* newView = gridOf(kind);

@@ -169,6 +169,7 @@ private:
     bool m_connected = false;
     bool m_deferSummary = false;
     bool m_refreshing = false;
+    bool m_changingView = false;
     int m_summaryRebuilds = 0;
     int m_percent = 60;
     QString m_currentLetter;

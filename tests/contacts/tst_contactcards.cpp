@@ -166,7 +166,9 @@ private Q_SLOTS:
         Tcontactlistframe f(&env.dm());
         QVERIFY(f.DBConnect(&env.host()));
         env.add(6, QStringLiteral("Neu"));
+        const int rebuilds = f.summaryRebuilds();
         QVERIFY(f.ChangeView(Tcontactlistframe::CardView));
+        QCOMPARE(f.summaryRebuilds(), rebuilds + 1); // one summary per switch
         QVERIFY(env.dm().ibcds_card.isActive());
         QVERIFY(!env.dm().ibcds_list.isActive());
         QCOMPARE(f.controller()->recordCount(), 5);
