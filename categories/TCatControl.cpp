@@ -131,7 +131,7 @@ TCatControl::TCatControl(TDM2* dm, Callbacks callbacks, QWidget* parent)
 {
     setObjectName(QStringLiteral("CatControl"));
     setWindowTitle(QStringLiteral("Kategorieverwaltung"));
-    resize(780, 500);
+    resize(940, 540);
     buildLayout();
     buildColumns();
     buildActions();
@@ -269,8 +269,10 @@ void TCatControl::buildLayout()
 
     m_splitter->addWidget(left);
     m_splitter->addWidget(right);
-    m_splitter->setStretchFactor(0, 2);
-    m_splitter->setStretchFactor(1, 3);
+    m_splitter->setStretchFactor(0, 0);
+    m_splitter->setStretchFactor(1, 1);
+    // Room for both category columns at their designed widths.
+    m_splitter->setSizes({ 330, 600 });
     setCentralWidget(central);
     statusBar()->setObjectName(QStringLiteral("dxStatusBar1"));
 
@@ -479,9 +481,12 @@ QString TCatControl::execPick()
 void TCatControl::applyColorScheme()
 {
     const int scheme = appColorScheme();
+    const ListFrameColors& c = listFrameColors(scheme);
+    // The sheet first: setting one re-polishes the children and would drop their palettes.
+    setStyleSheet(QStringLiteral("QToolBar { background: %1; border: none; } QStatusBar { background: %1; }")
+                      .arg(c.panel.name()));
     m_katScaffold->applyColorScheme(scheme);
     m_detailScaffold->applyColorScheme(scheme);
-    const ListFrameColors& c = listFrameColors(scheme);
     for (QWidget* w : { centralWidget(), static_cast<QWidget*>(m_splitter) }) {
         QPalette p = w->palette();
         p.setColor(QPalette::Window, c.panel);
@@ -489,8 +494,6 @@ void TCatControl::applyColorScheme()
         w->setAutoFillBackground(true);
     }
     static_cast<KatFooter*>(m_footer)->setColors(c);
-    setStyleSheet(QStringLiteral("QToolBar { background: %1; border: none; } QStatusBar { background: %1; }")
-                      .arg(c.panel.name()));
 }
 
 // ---------------------------------------------------------------------------------------------
@@ -893,7 +896,7 @@ void TCatControl::Kon_MoveExecute()
             return;
         if (!ChangeConKat(*m_dm, lid, form.chosenId()))
             return;
-        rereadDetail(0);
+        rereadDetail(lid); // the link keeps its key: the moved contact stays marked
         if (m_callbacks.ChangeRelatedKontKat)
             m_callbacks.ChangeRelatedKontKat(cid, form.chosenName());
     } catch (const std::exception& e) {
@@ -996,7 +999,7 @@ void TCatControl::Grid1DBTableView1DragDrop(const QMimeData* data, const QPoint&
         m_dragLid = m_dragCid = 0;
         if (!ChangeConKat(*m_dm, lid, target))
             return;
-        rereadDetail(0);
+        rereadDetail(lid); // the link keeps its key: the moved contact stays marked
         if (m_callbacks.ChangeRelatedKontKat)
             m_callbacks.ChangeRelatedKontKat(cid, name);
     } catch (const std::exception& e) {
