@@ -207,7 +207,11 @@ TCatControl::~TCatControl()
     // Freed with its owner while open: keep what the user arranged, as closing would.
     if (m_shown && !m_closed) {
         m_closed = true;
-        FormClose();
+        try {
+            FormClose();
+        } catch (const std::exception& e) {
+            logError(kLabel + QStringLiteral("FormClose"), &e);
+        }
     }
     // The grids must not outlive the stores they read.
     m_katView->setSource(nullptr);
@@ -831,6 +835,12 @@ void TCatControl::Kat_DeleteExecute()
     }
     const int id = m_focusedId;
     const QString name = categoryText(row, "KATBEZ");
+    // While the keys rest the list may still show the category before: an empty list there must
+    // not make a category with contacts look empty.
+    if (m_loadedId != id) {
+        m_t1->stop();
+        KatDetailDBConnect(id);
+    }
     DataSet& detail = m_dm->katdetail;
     if (!detail.isActive()) {
         reportError(label + QStringLiteral("Der Kategorie zugeordnete Kontakte konnten nicht ermittelt werden.")

@@ -316,6 +316,63 @@ private Q_SLOTS:
         w->close();
     }
 
+    void deletingRightAfterAKeyStepAsksAboutTheFocusedCategory()
+    {
+        CategoryTestEnv env;
+        env.addCategory(1, QStringLiteral("Alpha"));
+        env.addCategory(2, QStringLiteral("Beta"));
+        env.addContact(10, QStringLiteral("Anna"), 2);
+        env.addContact(11, QStringLiteral("Bert"), 2);
+        Calls calls;
+        auto w = manager(env, calls);
+        w->show();
+        QCOMPARE(w->footerText(), QStringLiteral("Kontakte: 0"));
+        QTest::keyClick(w->categoryView(), Qt::Key_Down);
+        QCOMPARE(w->focusedCategoryId(), 2);
+        QVERIFY(w->delayTimer()->isActive()); // the list still shows Alpha's (no) contacts
+        env.dialogs().enqueueAnswer(DialogButton::No);
+        act(*w, "Kat_Delete")->trigger();
+        QVERIFY(env.dialogs().last().text.startsWith(
+            QStringLiteral("Der zu löschenden Kategorie \"Beta\" sind derzeit 2\r\n")));
+        QCOMPARE(env.count(QStringLiteral("SELECT COUNT(*) FROM KAT")), 2);
+        w->close();
+    }
+
+    void anOpenDialogBlocksTheOthersAndAVanishedCategoryLeavesTheList()
+    {
+        CategoryTestEnv env;
+        fill(env);
+        Calls calls;
+        auto w = manager(env, calls);
+        w->show();
+        QStringList whileOpen;
+        onNextDialog<Tkateditform>([&](Tkateditform* d) {
+            for (const char* name : { "Kat_New", "Kat_Rename", "Kat_Delete" }) {
+                act(*w, name)->trigger();
+                whileOpen << env.dialogs().last().text;
+            }
+            // Meanwhile another program deletes the category being renamed.
+            env.db().exec(QStringLiteral("DELETE FROM KAT WHERE LID = 1"));
+            QTest::keyClicks(d->findChild<QLineEdit*>(QStringLiteral("RzE1")), QStringLiteral("2"));
+            QTest::mouseClick(d->findChild<QPushButton*>(QStringLiteral("RzB1")), Qt::LeftButton);
+        });
+        act(*w, "Kat_Rename")->trigger();
+        const QString busy = QStringLiteral("\r\nDerzeit ist noch eine Kategorie in Bearbeitung.\r\nBitte beenden Sie "
+                                            "zuerst die Arbeit mit der geöffneten Kategorie.");
+        QCOMPARE(whileOpen,
+                 QStringList({ QStringLiteral("# CatControl - Kat_NewExecute") + busy,
+                               QStringLiteral("# CatControl - Kat_RenameExecute") + busy,
+                               QStringLiteral("# CatControl - Kat_DeleteExecute") + busy }));
+        QVERIFY(env.dialogs().last().text.startsWith(
+            QStringLiteral("# CatControl - InsertKat\r\nEs ist ein Datenbankfehler bei der Bearbeitung aufgetreten!")));
+        QVERIFY(w->databaseError());
+        QVERIFY(calls.renamed.isEmpty());
+        QCOMPARE(column(w->categoryView(), "KAT_KATBEZ"),
+                 QStringList({ QStringLiteral("Freunde"), QStringLiteral("Leer") }));
+        QCOMPARE(column(w->contactView(), "KATD_CONTBEZ"), QStringList(QStringLiteral("Dora")));
+        w->close();
+    }
+
     void aContactDraggedOntoACategoryMovesThere()
     {
         CategoryTestEnv env;
