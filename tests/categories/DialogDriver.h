@@ -6,6 +6,7 @@
 #include <QTimer>
 
 #include <functional>
+#include <memory>
 
 namespace orvanta::test {
 
@@ -13,8 +14,15 @@ template <class Dialog> void onNextDialog(std::function<void(Dialog*)> step)
 {
     auto* timer = new QTimer;
     timer->setInterval(10);
-    QObject::connect(timer, &QTimer::timeout, [timer, step] {
+    // Gives up after ten seconds, so a dialog that never came cannot drive a later test.
+    auto ticks = std::make_shared<int>(1000);
+    QObject::connect(timer, &QTimer::timeout, [timer, step, ticks] {
         auto* d = qobject_cast<Dialog*>(QApplication::activeModalWidget());
+        if (--*ticks <= 0) {
+            timer->stop();
+            timer->deleteLater();
+            return;
+        }
         if (!d || !d->isVisible())
             return;
         timer->stop();
