@@ -31,6 +31,7 @@
 #include <QMenu>
 #include <QMenuBar>
 #include <QMouseEvent>
+#include <QMoveEvent>
 #include <QPainter>
 #include <QSplitter>
 #include <QStatusBar>
@@ -144,6 +145,14 @@ TCatControl::TCatControl(TDM2* dm, Callbacks callbacks, QWidget* parent)
     m_updateTimer = new QTimer(this);
     m_updateTimer->setInterval(200);
     connect(m_updateTimer, &QTimer::timeout, this, &TCatControl::updateActions);
+    // Snapping waits until the window rests, so it never fights the user's hand.
+    m_snapTimer = new QTimer(this);
+    m_snapTimer->setSingleShot(true);
+    m_snapTimer->setInterval(250);
+    connect(m_snapTimer, &QTimer::timeout, this, [this] {
+        if (isVisible() && !isMaximized() && !isFullScreen())
+            m_fs1->snap(*this);
+    });
     m_fs1 = std::make_unique<WindowBounds>(programFile(QStringLiteral("CCStore")), QStringLiteral("CatControl"), 15);
 
     connect(m_katView, &GridView::focusedRecordChanged, this, &TCatControl::categoryFocusChanged);
@@ -436,6 +445,13 @@ void TCatControl::closeEvent(QCloseEvent* event)
     QMainWindow::closeEvent(event);
     if (m_pickLoop)
         m_pickLoop->quit();
+}
+
+void TCatControl::moveEvent(QMoveEvent* event)
+{
+    QMainWindow::moveEvent(event);
+    if (m_snapTimer && isVisible())
+        m_snapTimer->start();
 }
 
 void TCatControl::FormClose()

@@ -116,6 +116,7 @@ public:
 protected:
     void showEvent(QShowEvent* event) override;
     void closeEvent(QCloseEvent* event) override;
+    void moveEvent(QMoveEvent* event) override;
     bool eventFilter(QObject* watched, QEvent* event) override;
 
 private:
@@ -182,6 +183,7 @@ private:
     QLabel* m_notice = nullptr;
     QTimer* m_t1 = nullptr;
     QTimer* m_updateTimer = nullptr;
+    QTimer* m_snapTimer = nullptr;
     QMenu* m_popup = nullptr;
     QAction* m_katNew = nullptr;
     QAction* m_katRename = nullptr;

@@ -79,6 +79,39 @@ QRect WindowBounds::placeOnScreens(QRect rect, const QList<QRect>& screens, int 
     return rect;
 }
 
+QRect WindowBounds::snapToEdges(QRect rect, const QList<QRect>& screens, int snap)
+{
+    const QRect* best = nullptr;
+    qint64 bestOverlap = 0;
+    for (const QRect& s : screens) {
+        const qint64 overlap = area(s.intersected(rect));
+        if (overlap > bestOverlap) {
+            bestOverlap = overlap;
+            best = &s;
+        }
+    }
+    if (!best)
+        return rect;
+    const QRect& s = *best;
+    if (qAbs(rect.left() - s.left()) <= snap)
+        rect.moveLeft(s.left());
+    else if (qAbs(s.right() - rect.right()) <= snap)
+        rect.moveRight(s.right());
+    if (qAbs(rect.top() - s.top()) <= snap)
+        rect.moveTop(s.top());
+    else if (qAbs(s.bottom() - rect.bottom()) <= snap)
+        rect.moveBottom(s.bottom());
+    return rect;
+}
+
+void WindowBounds::snap(QWidget& window) const
+{
+    const QRect frame = window.frameGeometry();
+    const QRect snapped = snapToEdges(frame, availableScreens(), m_snap);
+    if (snapped.topLeft() != frame.topLeft())
+        window.move(snapped.topLeft());
+}
+
 bool WindowBounds::restore(QWidget& window) const
 {
     const IniFile ini(m_file);

@@ -28,6 +28,11 @@ public:
     // nearest when it overlaps none, with each edge closer than snap pixels to that screen's edge
     // moved onto it.
     [[nodiscard]] static QRect placeOnScreens(QRect rect, const QList<QRect>& screens, int snap);
+    // Only the snapping, for a window the user moved: each edge closer than snap pixels to an edge
+    // of the screen it overlaps most goes onto it; a window partly off the screen stays so.
+    [[nodiscard]] static QRect snapToEdges(QRect rect, const QList<QRect>& screens, int snap);
+    // The same on the screens of this machine, for the window's frame.
+    void snap(QWidget& window) const;
 
 private:
     QString m_file;

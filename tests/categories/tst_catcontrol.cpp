@@ -495,6 +495,9 @@ private Q_SLOTS:
         QCOMPARE(w->geometry().size(), QSize(700, 450));
         QCOMPARE(column(w->categoryView(), "KAT_KATBEZ").size(), 3);
         QCOMPARE(w->footerText(), QStringLiteral("Kontakte: 3"));
+        // Moved near an edge, it snaps onto it once it rests.
+        w->move(screen.left() + 9, screen.top() + 40);
+        QTRY_COMPARE(w->pos(), QPoint(screen.left(), screen.top() + 40));
         w->close();
         IniFile bounds(env.file(QStringLiteral("CCStore")));
         QCOMPARE(bounds.readInteger(QStringLiteral("CatControl"), QStringLiteral("Right"), 0)
@@ -518,6 +521,9 @@ private Q_SLOTS:
         QCOMPARE(WindowBounds::placeOnScreens(QRect(870, 490, 400, 300), screens, 15), QRect(880, 500, 400, 300));
         // Mostly on the second screen: it stays there, wholly.
         QCOMPARE(WindowBounds::placeOnScreens(QRect(1200, 100, 400, 300), screens, 15), QRect(1280, 100, 400, 300));
+        // Moved by the user: only the snapping, a window partly off the screen stays so.
+        QCOMPARE(WindowBounds::snapToEdges(QRect(-8, 40, 400, 300), screens, 15), QRect(0, 40, 400, 300));
+        QCOMPARE(WindowBounds::snapToEdges(QRect(-100, 40, 400, 300), screens, 15), QRect(-100, 40, 400, 300));
         // Far off every screen: onto the nearest, and no larger than it.
         QCOMPARE(WindowBounds::placeOnScreens(QRect(-5000, 300, 2000, 300), screens, 15), QRect(0, 300, 1280, 300));
     }
