@@ -98,10 +98,8 @@ void HasRenameKatBez(TLogform& w, const QString& oldName, const QString& newName
         const TvkMiniKontakt* r = records.at(slot);
         if (!r || r->KATBEZ() != oldName)
             continue;
-        if (auto* form = qobject_cast<Tcontacteditform*>(w.windowRegistries().editWindowOfRecord(slot))) {
+        if (auto* form = qobject_cast<Tcontacteditform*>(w.windowRegistries().editWindowOfRecord(slot)))
             form->KatHasChanged(newName);
-            break;
-        }
     }
     if (ContactListFrame* list = w.contactFrame())
         list->Refresh_View(0);

@@ -13,8 +13,8 @@ void registerContactEditFeature(TLogform& mainWindow);
 
 // The category manager moved the contact to another category: its open edit window shows it.
 void ChangeRelatedKontKat(TLogform& mainWindow, int contactKey, const QString& katbez);
-// The category manager renamed a category: the first open edit window with that category shows
-// the new name.
+// The category manager renamed a category (or deleted it: empty new name): every open edit window
+// with that category shows the new name.
 void HasRenameKatBez(TLogform& mainWindow, const QString& oldName, const QString& newName);
 
 } // namespace orvanta
