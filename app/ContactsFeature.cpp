@@ -4,9 +4,10 @@
 #include "app/TLogform.h"
 #include "contacts/ContactDeletion.h"
 #include "contacts/ContactReports.h"
+#include "contacts/Tcontacteditform.h"
+#include "contacts/Tcontactlistframe.h"
 #include "db/TDM2.h"
 #include "platform/ErrorLog.h"
-#include "contacts/Tcontactlistframe.h"
 
 namespace orvanta {
 
@@ -65,6 +66,17 @@ void registerContactsFeature(TLogform& w)
                        [&w] { return contactChosen(w); });
     w.actions().define(QStringLiteral("_LogFo_PrintContactOverview"), [&w] { PrintContactOverviewExecute(w); },
                        [&w] { return w.contactFrame() && w.contactFrame()->isConnected(); });
+    // The edit window's note prints as the notes window's does; the window reports a failure.
+    Tcontacteditform::setNotePrinter([](const QString& designation, const QByteArray& rtf) {
+        ReportOutcome outcome;
+        NotePrintResult result;
+        if (!NotizDruck(designation, rtf, outcome)) {
+            result.code = reportResultName(outcome.code);
+            result.number = int(outcome.number);
+            result.message = outcome.message;
+        }
+        return result;
+    });
 }
 
 } // namespace orvanta

@@ -75,6 +75,7 @@ int Startup::run(int argc, char* argv[])
     // one per turn of the event loop, so that the code that opened each one goes on before
     // the window closes under it.
     TerminationSignals termination;
+    keepConnectionsOnTerminationSignals();
     QPointer<QWidget> mainWindow;
     bool terminating = false;
     int attempts = 0;

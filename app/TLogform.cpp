@@ -453,7 +453,8 @@ void TLogform::resizeEvent(QResizeEvent* e)
 
 void TLogform::saveBars()
 {
-    IniFile store;
+    // The contact edit windows keep their note tool bars in the same file.
+    IniFile store(programFile(QStringLiteral("BarStore")));
     store.setPath(programFile(QStringLiteral("BarStore")));
     store.writeString(QStringLiteral("BarStore"), QStringLiteral("State"),
                       QString::fromLatin1(saveState(1).toBase64()));

@@ -1,7 +1,7 @@
 #pragma once
-// What the database benchmarks share: a log database in a temporary folder that the data module
+// What the database benchmarks share: a database in a temporary folder that the data module
 // finds through the registry as at a real start, and the baseline every ratio is measured
-// against, a raw fetch of "SELECT * FROM LOG".
+// against, a raw fetch of one statement ("SELECT * FROM LOG" unless told otherwise).
 
 #include "db/CredentialCipher.h"
 #include "db/FbAttachment.h"
@@ -100,13 +100,13 @@ struct RawResult {
     quint64 checksum = 0;
 };
 
-// Reads every value of every row from the fetch buffer: fixed values by their width, text by all
-// of its bytes. Nothing is kept.
-inline RawResult rawFetch(FbAttachment& db, FbTransaction& tx)
+// Reads every value of every row of the statement (by default the whole log) from the fetch
+// buffer: fixed values by their width, text by all of its bytes. Nothing is kept.
+inline RawResult rawFetch(FbAttachment& db, FbTransaction& tx, const QString& sql = QStringLiteral("SELECT * FROM LOG"))
 {
     RawResult r;
     TDM2::restart(tx);
-    FbStatement st(db, &tx, QStringLiteral("SELECT * FROM LOG"));
+    FbStatement st(db, &tx, sql);
     st.execute();
     const int n = st.columnCount();
     while (st.next()) {

@@ -1,9 +1,8 @@
 #pragma once
 // The address cards of the contact list: which fields are card rows, in which order, with which
 // caption, which are shown, which the user may not move, and the two rows computed from hidden
-// ones ("Name" from surname and first name, "PLZ / Ort" from post code and town). The card view
-// is built from this table alone; until it exists, the card mode shows the cards' data set
-// (ibcds_card) in the table.
+// ones ("Name" from surname and first name, "PLZ / Ort" from post code and town). The contact
+// list builds its card view from this table alone.
 
 #include <QString>
 

@@ -1,6 +1,7 @@
 #include "contacts/Tcontactlistframe.h"
 
 #include "contacts/ContactAnchors.h"
+#include "contacts/ContactCardRows.h"
 #include "contacts/ContactSummary.h"
 #include "contacts/Tnotizviewform.h"
 #include "db/TDM2.h"
@@ -12,6 +13,7 @@
 #include "platform/ProgramFolder.h"
 #include "platform/WindowMessages.h"
 #include "ui/dialogs/BusyCursor.h"
+#include "ui/grid/GridCardView.h"
 #include "ui/grid/GridColumnMenu.h"
 #include "ui/grid/GridController.h"
 #include "ui/grid/GridLayoutPersistence.h"
@@ -28,7 +30,10 @@
 #include <QFile>
 #include <QHBoxLayout>
 #include <QLabel>
+#include <QLinearGradient>
 #include <QMenu>
+#include <QPainter>
+#include <QScopedValueRollback>
 #include <QScrollArea>
 #include <QSplitter>
 #include <QStyle>
@@ -54,6 +59,49 @@ QString columnName(const char* field)
 }
 
 using ViewLock = GridUpdateLock;
+
+// The footer under the table: a vertical gradient, a one-pixel border and black text inset by
+// three pixels, in the colours of the scheme.
+class FooterLabel final : public QLabel {
+public:
+    using QLabel::QLabel;
+
+    void setColors(const QColor& top, const QColor& bottom, const QColor& border)
+    {
+        m_top = top;
+        m_bottom = bottom;
+        m_border = border;
+        update();
+    }
+
+protected:
+    void paintEvent(QPaintEvent*) override
+    {
+        QPainter p(this);
+        const QRect r = rect();
+        QLinearGradient g(r.topLeft(), r.bottomLeft());
+        g.setColorAt(0, m_top);
+        g.setColorAt(1, m_bottom);
+        p.fillRect(r, g);
+        p.setPen(m_border);
+        p.drawRect(r.adjusted(0, 0, -1, -1));
+        p.setPen(Qt::black);
+        p.setFont(font());
+        p.drawText(r.adjusted(3, 0, -3, 0), Qt::AlignLeft | Qt::AlignVCenter, text());
+    }
+
+private:
+    QColor m_top{Qt::white};
+    QColor m_bottom{Qt::lightGray};
+    QColor m_border{Qt::gray};
+};
+
+// The text of a source field, empty for null or a field the source does not have.
+QString fieldText(const GridSource& s, quint32 record, const QString& field)
+{
+    const int f = s.fieldIndex(field);
+    return f < 0 || s.isNull(record, f) ? QString() : s.text(record, f);
+}
 
 } // namespace
 
@@ -81,16 +129,43 @@ Tcontactlistframe::Tcontactlistframe(TDM2* dm, QWidget* parent)
             });
         }
     }
-    connect(m_view, &GridView::focusedRecordChanged, this, &Tcontactlistframe::FocusedRecordChanged);
-    connect(controller(), &GridController::layoutChanged, this, &Tcontactlistframe::updateFooter);
-    connect(m_view, &GridView::rowDoubleClicked, this, [this](int row) {
-        if (controller()->isGroupRow(row))
+    connectView(m_view);
+    connectView(m_cards);
+    connect(m_view, &GridView::columnDraggedOut, m_columnMenu, &GridColumnMenu::columnDraggedOut);
+    connect(m_summary, &MarkupPanel::anchorClicked, this, &Tcontactlistframe::HTMLStaticText1AnchorClick);
+    showActiveView();
+    cv_editcontUpdate();
+    updateFooter();
+}
+
+Tcontactlistframe::~Tcontactlistframe()
+{
+    // The grids must not outlive the source they read.
+    m_view->setSource(nullptr);
+    m_cards->setSource(nullptr);
+}
+
+// Both views report to the same handlers; only the active one counts (the other has no source,
+// but unbinding it still announces a change of focus).
+void Tcontactlistframe::connectView(GridViewBase* view)
+{
+    const auto active = [this, view] { return view == activeGrid(); };
+    connect(view, &GridViewBase::focusedRecordChanged, this, [this, active] {
+        if (active() && !m_changingView)
+            FocusedRecordChanged();
+    });
+    connect(view->controller(), &GridController::layoutChanged, this, [this, active] {
+        if (active())
+            updateFooter();
+    });
+    connect(view, &GridViewBase::rowDoubleClicked, this, [this, view](int row) {
+        if (view->controller()->isGroupRow(row))
             return;
         cv_editcontUpdate();
         if (m_editCont->isEnabled())
             m_editCont->trigger();
     });
-    connect(m_view, &GridView::keyPressed, this, [this](int key, Qt::KeyboardModifiers) {
+    connect(view, &GridViewBase::keyPressed, this, [this](int key, Qt::KeyboardModifiers) {
         switch (key) {
         case Qt::Key_PageUp:
         case Qt::Key_PageDown:
@@ -109,25 +184,40 @@ Tcontactlistframe::Tcontactlistframe(TDM2* dm, QWidget* parent)
             break;
         }
     });
-    connect(m_view, &GridView::rowContextMenuRequested, this, &Tcontactlistframe::showPopup);
-    connect(m_view, &GridView::columnDraggedOut, m_columnMenu, &GridColumnMenu::columnDraggedOut);
-    connect(m_summary, &MarkupPanel::anchorClicked, this, &Tcontactlistframe::HTMLStaticText1AnchorClick);
-    controller()->setKeyField(QStringLiteral("LID"));
-    controller()->setFocusFirstAfterSort(true);
-    cv_editcontUpdate();
-    updateFooter();
+    connect(view, &GridViewBase::rowContextMenuRequested, this, &Tcontactlistframe::showPopup);
+    view->controller()->setKeyField(QStringLiteral("LID"));
+    view->controller()->setFocusFirstAfterSort(true);
 }
 
-Tcontactlistframe::~Tcontactlistframe()
+GridViewBase* Tcontactlistframe::gridOf(int viewKind) const
 {
-    // The grid must not outlive the source it reads.
-    if (m_view)
-        m_view->setSource(nullptr);
+    if (viewKind == CardView)
+        return m_cards;
+    return m_view;
+}
+
+GridViewBase* Tcontactlistframe::activeGrid() const
+{
+    return gridOf(m_viewKind);
 }
 
 GridController* Tcontactlistframe::controller() const
 {
-    return m_view->controller();
+    return activeGrid()->controller();
+}
+
+QMenu* Tcontactlistframe::popupMenu() const
+{
+    return m_viewKind == CardView ? m_cardPopup : m_popup;
+}
+
+// Only the active view is on screen; the footer belongs to the table.
+void Tcontactlistframe::showActiveView()
+{
+    const bool cards = m_viewKind == CardView;
+    m_view->setVisible(!cards);
+    m_cards->setVisible(cards);
+    m_footer->setVisible(!cards);
 }
 
 QString Tcontactlistframe::viewStoreFile()
@@ -155,6 +245,8 @@ void Tcontactlistframe::buildLayout()
     m_view->setHeaderHeight(21);
     m_view->setAutoWidth(true);
     m_view->setSortedColumnColor(QColor(0xEF, 0xEF, 0xEF));
+    m_cards = m_scaffold->addCardView(QStringLiteral("cxGrid1DBCardView1"));
+    m_cards->setCardWidth(kContactCardWidth);
 
     // The grid host goes into the splitter above the summary, the letter bar to their right.
     QWidget* gridHost = m_scaffold->gridHost();
@@ -181,11 +273,10 @@ void Tcontactlistframe::buildLayout()
     gridHost->setParent(gridPart);
     gridPartLayout->addWidget(gridHost, 1);
     // The footer: the count of the contacts the filter lets through.
-    m_footer = new QLabel(gridPart);
+    m_footer = new FooterLabel(gridPart);
     m_footer->setObjectName(QStringLiteral("cxGrid1DBTableView1Footer"));
     m_footer->setFont(QFont(QStringLiteral("Verdana"), 8));
-    m_footer->setMargin(3);
-    m_footer->setAutoFillBackground(true);
+    m_footer->setFixedHeight(QFontMetrics(m_footer->font()).height() + 8);
     gridPartLayout->addWidget(m_footer);
     m_splitter->addWidget(gridPart);
 
@@ -265,7 +356,50 @@ void Tcontactlistframe::buildColumns()
     add("ZUSATZ", QStringLiteral("Anschriftenzusatz"), 11, 0);
     add("LAND", QStringLiteral("Land"), 12, 0);
     add("BUNDESLAND", QStringLiteral("Bundesland"), 13, 0);
-    controller()->setSortOrder(contbez, GridSortOrder::Ascending);
+    m_view->controller()->setSortOrder(contbez, GridSortOrder::Ascending);
+    buildCards();
+}
+
+void Tcontactlistframe::buildCards()
+{
+    // The computed rows read the hidden rows of the same card, found by their captions.
+    const auto fieldOfCaption = [](const char* caption) {
+        for (const ContactCardRow& r : contactCardRows())
+            if (r.field && qstrcmp(r.caption, caption) == 0)
+                return QString::fromLatin1(r.field);
+        return QString();
+    };
+    const QString surname = fieldOfCaption("Nachname");
+    const QString firstName = fieldOfCaption("Vorname");
+    const QString postCode = fieldOfCaption("PLZ");
+    const QString town = fieldOfCaption("Ort");
+    GridController* g = m_cards->controller();
+    for (const ContactCardRow& r : contactCardRows()) {
+        GridColumn c(QLatin1String(r.name), r.field ? QLatin1String(r.field) : QString(), QString::fromUtf8(r.caption),
+                     r.tag, kContactCardWidth);
+        c.visible = r.visible;
+        c.movable = r.movable;
+        c.groupable = false;
+        c.showInColumnMenu = r.tag != 0;
+        if (!r.field) {
+            c.sortable = false;
+            if (qstrcmp(r.caption, "Name") == 0)
+                c.displayText = [surname, firstName](const GridSource& s, quint32 record) {
+                    return contactCardName(fieldText(s, record, surname), fieldText(s, record, firstName));
+                };
+            else
+                c.displayText = [postCode, town](const GridSource& s, quint32 record) {
+                    return contactCardPlace(fieldText(s, record, postCode), fieldText(s, record, town));
+                };
+        }
+        if (r.tag == 0)
+            c.sortable = false;
+        const int column = m_cards->addColumn(c);
+        if (r.captionRow) {
+            m_cards->setCaptionColumn(column);
+            g->setSortOrder(column, GridSortOrder::Ascending);
+        }
+    }
 }
 
 void Tcontactlistframe::buildActions()
@@ -302,6 +436,29 @@ void Tcontactlistframe::buildActions()
                                                  "Bundesland"};
     for (int i = 0; i < 13; ++i)
         m_columnMenu->addEntry(QStringLiteral("tvum%1").arg(i + 1), QString::fromUtf8(captions[i]), i + 1);
+    // tvum1Click: only while the table is active.
+    m_columnMenu->setClickHandler([this](QAction* a) {
+        if (m_viewKind == TableView)
+            SetTableColVisibleState(a->isChecked(), a->property("tag").toInt());
+    });
+
+    m_cardPopup = new QMenu(this);
+    m_cardPopup->setObjectName(QStringLiteral("AdvPopupMenu1"));
+    m_cardPopup->addAction(m_newCont);
+    m_cardPopup->addAction(m_editCont);
+    m_cardPopup->addSeparator();
+    m_cardPopup->addAction(m_deleteCont);
+    m_cardPopup->addSeparator();
+    m_rowMenu = new GridColumnMenu(m_cards, m_cardPopup, QStringLiteral("Ansicht2"), this);
+    static constexpr const char* rowCaptions[10] = {"Anrede",   "Titel",  "Name/Vorname",      "Firma", "Kategorie",
+                                                    "Straße",   "PLZ/Ort", "Anschriftenzusatz", "Land",  "Bundesland"};
+    for (int i = 0; i < 10; ++i)
+        m_rowMenu->addEntry(QStringLiteral("CVUM%1").arg(i + 1), QString::fromUtf8(rowCaptions[i]), i + 1);
+    // CVUM1Click: only while the cards are active.
+    m_rowMenu->setClickHandler([this](QAction* a) {
+        if (m_viewKind == CardView)
+            SetCardRowVisibleState(a->isChecked(), a->property("tag").toInt());
+    });
 }
 
 // ---------------------------------------------------------------------------------------------
@@ -327,20 +484,65 @@ void Tcontactlistframe::bindSource()
     }
     if (!m_source || &m_source->store() != &ds->store()) {
         m_view->setSource(nullptr);
+        m_cards->setSource(nullptr);
         m_source = std::make_unique<RecordStoreGridSource>(ds->store());
     }
-    m_view->setSource(m_source.get());
+    activeGrid()->setSource(m_source.get());
 }
 
 void Tcontactlistframe::detachSource()
 {
-    if (controller()->source())
-        m_view->setSource(nullptr);
+    for (GridViewBase* v : {static_cast<GridViewBase*>(m_view), static_cast<GridViewBase*>(m_cards)})
+        if (v->controller()->source())
+            v->setSource(nullptr);
     m_source.reset();
     updateFooter();
 }
 
-void Tcontactlistframe::openView(int viewKind, const char* statement)
+bool Tcontactlistframe::storeLayout(int viewKind) const
+{
+    if (viewKind == CardView)
+        return m_cards->storeLayout(m_layouts->file(CardView), m_layouts->viewName());
+    return m_layouts->store(*m_view->controller(), TableView);
+}
+
+void Tcontactlistframe::restoreLayout(int viewKind)
+{
+    if (viewKind == CardView) {
+        m_cards->restoreLayout(m_layouts->file(CardView), m_layouts->viewName());
+        // The cards offer no way to sort; a layout that lost every sort key (a damaged file)
+        // must not leave them in the order the server happened to deliver.
+        GridController* g = m_cards->controller();
+        if (g->sortedColumns().empty() && m_cards->captionColumn() >= 0)
+            g->setSortOrder(m_cards->captionColumn(), GridSortOrder::Ascending);
+    } else {
+        m_layouts->restore(*m_view->controller(), TableView);
+    }
+}
+
+GridFilter Tcontactlistframe::filterForView(const GridFilter& filter, const GridController& from,
+                                            const GridController& to)
+{
+    GridFilter out = filter;
+    const std::function<void(GridFilterItem&)> remap = [&](GridFilterItem& item) {
+        if (item.isList) {
+            for (GridFilterItem& sub : item.items)
+                remap(sub);
+            return;
+        }
+        const int c = from.columnByName(item.column);
+        if (c < 0)
+            return;
+        const int target = to.columnByField(from.column(c).fieldName);
+        if (target >= 0)
+            item.column = to.column(target).name;
+    };
+    remap(out.root);
+    return out;
+}
+
+void Tcontactlistframe::openView(int viewKind, const char* statement, DataSet* rowsFrom,
+                                 GridController::FieldRanks ranks)
 {
     DataSet* ds = dataSetOf(viewKind);
     if (!ds)
@@ -348,10 +550,15 @@ void Tcontactlistframe::openView(int viewKind, const char* statement)
     detachSource();
     ds->close();
     ds->setCommandText(QString::fromLatin1(statement));
-    ds->open();
+    const bool sameRows = rowsFrom && ds->openWithRowsOf(*rowsFrom);
+    if (!sameRows)
+        ds->open();
     bindSource();
+    // The same rows: the sort keys the old view computed hold for this one too.
+    if (sameRows && controller()->isActive())
+        controller()->adoptFieldRanks(std::move(ranks));
     if (ds->isActive())
-        m_layouts->restore(*controller(), viewKind);
+        restoreLayout(viewKind);
 }
 
 bool Tcontactlistframe::isConnected() const
@@ -376,12 +583,13 @@ bool Tcontactlistframe::DBConnect(QObject* mainWindow)
             m_dm->SelectedLID = -1;
         m_cl1->setText(QStringLiteral("Kontakte (alle)"));
         GetAndSetView();
+        showActiveView();
         {
-            ViewLock lock(m_view);
+            ViewLock lock(activeGrid());
             openView(m_viewKind, m_viewKind == CardView ? dmsql::kSelectContactCards : dmsql::kSelectContactList);
         }
         SyncFilterState();
-        SetTableViewPopup();
+        setViewPopup();
         m_connected = true;
         setEnabled(true);
     } catch (const std::exception& e) {
@@ -405,7 +613,7 @@ void Tcontactlistframe::DBDisconnect()
         postMessage(m_host, WMSEARCHUNCHECKED, 0, 0);
         DataSet* ds = dataSetOf(m_viewKind);
         if (ds && ds->isActive() && controller()->source()) {
-            if (!m_layouts->store(*controller(), m_viewKind))
+            if (!storeLayout(m_viewKind))
                 logError(kLabel + QStringLiteral("DBDisconnect\r\nDie Ansicht konnte nicht gespeichert werden."));
         }
         if (m_viewKind != NoView)
@@ -454,7 +662,7 @@ void Tcontactlistframe::GetAndSetView()
     int kind = TableView;
     int percent = kDefaultPercent;
     try {
-        ViewLock lock(m_view);
+        ViewLock lock(activeGrid());
         GetGridView(kind, percent);
     } catch (const std::exception& e) {
         logError(QStringLiteral("# GetAndSetView"), &e);
@@ -494,42 +702,66 @@ bool Tcontactlistframe::ChangeView(int kind)
     m_deferSummary = false;
     m_t1->stop();
     BusyCursor busy;
+    const int focusedLid = m_dm ? m_dm->SelectedLID : -1;
+    // The views announce their focus on the way; the summary is built once, at the end.
+    const QScopedValueRollback<bool> changing(m_changingView, true);
     try {
-        ViewLock lock(m_view);
-        GridController* g = controller();
+        GridViewBase* oldView = activeGrid();
+        GridViewBase* newView = gridOf(kind);
+        ViewLock oldLock(oldView);
+        ViewLock newLock(newView);
+        GridController* from = oldView->controller();
+        GridController* to = newView->controller();
         // The letter filter follows the user into the other view.
-        const GridFilter filter = g->filter();
-        const int tag = g->tag();
+        const GridFilter filter = filterForView(from->filter(), *from, *to);
+        const int tag = from->tag();
         DataSet* old = dataSetOf(m_viewKind);
-        if (old && old->isActive() && g->source())
-            (void)m_layouts->store(*g, m_viewKind);
+        if (old && old->isActive() && from->source() && !storeLayout(m_viewKind))
+            logError(kLabel + QStringLiteral("ChangeView\r\nDie Ansicht konnte nicht gespeichert werden."));
+        GridController::FieldRanks ranks = from->takeFieldRanks();
         detachSource();
+        m_viewKind = kind;
+        showActiveView();
+        // V_SELECT_CARD is V_SELECT_LIST under another name: the new view takes over the rows the
+        // old one read instead of reading the whole address book again (seconds for a large
+        // one). Refresh_View reads afresh.
+        openView(kind, kind == CardView ? dmsql::kSelectContactCards : dmsql::kSelectContactList,
+                 old && old->isActive() ? old : nullptr, std::move(ranks));
         if (old)
             old->close();
-        m_viewKind = kind;
-        openView(kind, kind == CardView ? dmsql::kSelectContactCards : dmsql::kSelectContactList);
-        g->setFilter(filter);
-        g->setFilterActive(filter.active);
-        g->setTag(tag);
+        to->setFilter(filter);
+        to->setFilterActive(filter.active);
+        to->setTag(tag);
+        // So does the focused contact, when the other view shows it.
+        if (focusedLid > 0 && to->isActive()) {
+            const int record = to->locate(focusedLid);
+            if (record >= 0)
+                to->focusRecord(static_cast<quint32>(record));
+        }
     } catch (const std::exception& e) {
         BusyCursor::resetCursor();
         reportError(kLabel + QStringLiteral("ChangeView"), &e);
+        FocusedRecordChanged();
         return false;
     }
     SyncFilterState();
-    SetTableViewPopup();
+    setViewPopup();
     FocusedRecordChanged();
-    if (m_view->isEnabled() && m_view->isVisible())
-        m_view->setFocus();
+    updateFooter();
+    GridViewBase* grid = activeGrid();
+    if (grid->isEnabled() && grid->isVisible())
+        grid->setFocus();
     return true;
 }
 
 void Tcontactlistframe::DisableFrame()
 {
     m_view->setEnabled(false);
+    m_cards->setEnabled(false);
     m_summary->setEnabled(false);
-    for (QAction* a : m_popup->actions())
-        a->setEnabled(false);
+    for (QMenu* menu : {m_popup, m_cardPopup, m_columnMenu->menu(), m_rowMenu->menu()})
+        for (QAction* a : menu->actions())
+            a->setEnabled(false);
     for (QAbstractButton* b : m_letters->buttons())
         b->setEnabled(false);
 }
@@ -579,20 +811,21 @@ void Tcontactlistframe::SetNewFilter(int t)
             m_filterColumn = QStringLiteral("Kontakt");
             const QString letter(QChar(u'A' + t - 1));
             if (letter != m_currentLetter) {
-                ViewLock lock(m_view);
+                ViewLock lock(activeGrid());
                 g->clearFilterItems();
                 g->setFilterActive(false);
                 std::vector<GridFilterItem> conditions;
+                const int contbez = g->columnByField(u"CONTBEZ");
+                const QString column = contbez >= 0 ? g->column(contbez).name : columnName("CONTBEZ");
                 for (const QString& p : letterPatterns(t))
-                    conditions.push_back(
-                        GridFilterItem::condition(columnName("CONTBEZ"), GridFilterOperator::Like, p, p));
+                    conditions.push_back(GridFilterItem::condition(column, GridFilterOperator::Like, p, p));
                 g->addFilterItem(GridFilterItem::list(GridFilterBoolOperator::Or, std::move(conditions)));
                 g->setTag(t);
                 m_currentLetter = letter;
                 g->setFilterActive(true);
             }
         } else if (t == 0 && (!m_currentLetter.isEmpty() || g->tag() != 0)) {
-            ViewLock lock(m_view);
+            ViewLock lock(activeGrid());
             g->setFilterActive(false);
             g->setTag(0);
             g->clearFilterItems();
@@ -655,9 +888,10 @@ void Tcontactlistframe::SyncFilterState()
 void Tcontactlistframe::SetCONTBEZSort()
 {
     try {
-        const int c = controller()->columnByField(u"CONTBEZ");
+        GridController* g = m_view->controller();
+        const int c = g->columnByField(u"CONTBEZ");
         if (c >= 0)
-            controller()->setSortOrder(c, GridSortOrder::Ascending);
+            g->setSortOrder(c, GridSortOrder::Ascending);
     } catch (const std::exception& e) {
         reportError(kLabel + QStringLiteral("SetCONTBEZSort"), &e);
     }
@@ -667,7 +901,7 @@ void Tcontactlistframe::NoGroup()
 {
     try {
         ViewLock lock(m_view);
-        GridController* g = controller();
+        GridController* g = m_view->controller();
         for (const int c : std::vector<int>(g->groupedColumns())) {
             g->ungroup(c);
             g->setColumnVisible(c, true);
@@ -682,11 +916,12 @@ void Tcontactlistframe::NoGroup()
 void Tcontactlistframe::ColuGroup(const char* field)
 {
     try {
-        const int c = controller()->columnByField(QString::fromLatin1(field));
+        GridController* g = m_view->controller();
+        const int c = g->columnByField(QString::fromLatin1(field));
         if (c < 0)
             return;
-        controller()->groupBy(c, 0);
-        controller()->setColumnVisible(c, false);
+        g->groupBy(c, 0);
+        g->setColumnVisible(c, false);
     } catch (const std::exception& e) {
         reportError(kLabel + QStringLiteral("ColuGroup"), &e);
     }
@@ -749,7 +984,7 @@ void Tcontactlistframe::ExpandGroups(bool expand)
     if (m_viewKind != TableView || !controller()->isActive())
         return;
     ViewLock lock(m_view);
-    controller()->expandAll(expand);
+    m_view->controller()->expandAll(expand);
 }
 
 // ---------------------------------------------------------------------------------------------
@@ -793,7 +1028,9 @@ void Tcontactlistframe::FocusedRecordChanged()
         m_t1->stop();
         m_dm->SelectedLID = -1;
         m_selectedContBez.clear();
-        logError(kLabel + QStringLiteral("TableViewFocusedRecordChanged"), &e);
+        // The cards' handler fails silently.
+        if (m_viewKind != CardView)
+            logError(kLabel + QStringLiteral("TableViewFocusedRecordChanged"), &e);
     }
     cv_editcontUpdate();
 }
@@ -856,7 +1093,7 @@ void Tcontactlistframe::Refresh_View(int lid)
     try {
         if (ds && ds->isActive()) {
             BusyCursor busy;
-            ViewLock lock(m_view);
+            ViewLock lock(activeGrid());
             m_refreshing = true;
             try {
                 ds->refresh();
@@ -872,8 +1109,8 @@ void Tcontactlistframe::Refresh_View(int lid)
                 if (record >= 0)
                     controller()->focusRecord(static_cast<quint32>(record));
             }
-            if (m_view->isVisible())
-                m_view->setFocus();
+            if (activeGrid()->isVisible())
+                activeGrid()->setFocus();
         }
     } catch (const std::exception& e) {
         BusyCursor::resetCursor();
@@ -926,6 +1163,26 @@ void Tcontactlistframe::SetTableViewPopup()
     m_columnMenu->checkVisibleColumns();
 }
 
+void Tcontactlistframe::SetCardViewPopup()
+{
+    m_rowMenu->checkVisibleColumns();
+}
+
+void Tcontactlistframe::setViewPopup()
+{
+    const bool cards = m_viewKind == CardView;
+    try {
+        if (cards)
+            SetCardViewPopup();
+        else
+            SetTableViewPopup();
+    } catch (const std::exception& e) {
+        reportError(kLabel + (cards ? QStringLiteral("DBConnect - SetCardViewPopup")
+                                    : QStringLiteral("DBConnect - SetTableViewPopup")),
+                    &e);
+    }
+}
+
 void Tcontactlistframe::SetTableColVisibleState(bool visible, int tag)
 {
     try {
@@ -935,10 +1192,19 @@ void Tcontactlistframe::SetTableColVisibleState(bool visible, int tag)
     }
 }
 
+void Tcontactlistframe::SetCardRowVisibleState(bool visible, int tag)
+{
+    try {
+        m_rowMenu->setColumnVisible(visible, tag);
+    } catch (const std::exception& e) {
+        reportError(kLabel + QStringLiteral("SetCardRowVisibleState"), &e);
+    }
+}
+
 void Tcontactlistframe::showPopup(const QPoint& globalPos)
 {
     cv_editcontUpdate();
-    m_popup->popup(globalPos);
+    popupMenu()->popup(globalPos);
 }
 
 void Tcontactlistframe::ApplyColorScheme()
@@ -952,10 +1218,7 @@ void Tcontactlistframe::ApplyColorScheme()
         w->setPalette(p);
         w->setAutoFillBackground(true);
     }
-    QPalette fp = m_footer->palette();
-    fp.setColor(QPalette::Window, c.panel);
-    fp.setColor(QPalette::WindowText, Qt::black);
-    m_footer->setPalette(fp);
+    static_cast<FooterLabel*>(m_footer)->setColors(c.footerStart, c.footerEnd, c.footerBorder);
 }
 
 } // namespace orvanta

@@ -4,9 +4,11 @@
 // the designation, grouping by category, post code or town, a column menu, and the summary of
 // the focused contact under the grid. Layouts live in the program folder: "VStore" (which view,
 // splitter position), "VStoreT" (table), "VStoreC" (cards). It writes nothing: new, edit and
-// delete are posted to the host, which refreshes the list afterwards.
+// delete are posted to the host, which refreshes the list afterwards. Each view has its own
+// controller; the letter filter and the focused contact follow the user from one to the other.
 
 #include "ui/frames/ContactListFrame.h"
+#include "ui/grid/GridController.h"
 
 #include <QPointer>
 #include <QStringList>
@@ -27,10 +29,13 @@ class QToolButton;
 namespace orvanta {
 
 class DataSet;
+class GridCardView;
 class GridColumnMenu;
 class GridController;
+struct GridFilter;
 class GridLayoutPersistence;
 class GridView;
+class GridViewBase;
 class ListFrameScaffold;
 class MarkupPanel;
 class RecordStoreGridSource;
@@ -93,14 +98,19 @@ public:
 
     // --- parts ------------------------------------------------------------------------------
     [[nodiscard]] int activeView() const { return m_viewKind; }
+    // The table (cxGrid1DBTableView1) and the cards (cxGrid1DBCardView1); one of them is shown.
     [[nodiscard]] GridView* view() const { return m_view; }
+    [[nodiscard]] GridCardView* cardView() const { return m_cards; }
+    [[nodiscard]] GridViewBase* activeGrid() const;
+    // The active view's controller.
     [[nodiscard]] GridController* controller() const;
     [[nodiscard]] QSplitter* splitter() const { return m_splitter; }
     // The splitter position as the upper part's percentage.
     [[nodiscard]] int splitterPercent() const;
     void setSplitterPercent(int percent);
     [[nodiscard]] QString footerText() const;
-    [[nodiscard]] QMenu* popupMenu() const { return m_popup; }
+    // The active view's context menu (table AdvPopupMenu2, cards AdvPopupMenu1).
+    [[nodiscard]] QMenu* popupMenu() const;
     // "VStore", "VStoreT", "VStoreC" in the program folder.
     [[nodiscard]] static QString viewStoreFile();
     [[nodiscard]] static QString layoutFile(int viewKind);
@@ -108,7 +118,9 @@ public:
     // The enable rule of the three contact actions.
     void cv_editcontUpdate();
     void SetTableViewPopup();
+    void SetCardViewPopup();
     void SetTableColVisibleState(bool visible, int tag);
+    void SetCardRowVisibleState(bool visible, int tag);
     void ApplyColorScheme();
 
 protected:
@@ -118,12 +130,25 @@ private:
     void applySplitterPercent();
     void buildLayout();
     void buildColumns();
+    void buildCards();
     void buildActions();
+    void connectView(GridViewBase* view);
+    void showActiveView();
+    void setViewPopup();
+    [[nodiscard]] GridViewBase* gridOf(int viewKind) const;
+    [[nodiscard]] bool storeLayout(int viewKind) const;
+    void restoreLayout(int viewKind);
+    // The old view's filter for the new view's columns: conditions follow their field.
+    [[nodiscard]] static GridFilter filterForView(const GridFilter& filter, const GridController& from,
+                                                  const GridController& to);
     void buildLetterBar(QWidget* parent);
     void bindSource();
     void detachSource();
     [[nodiscard]] DataSet* dataSetOf(int viewKind) const;
-    void openView(int viewKind, const char* statement);
+    // rowsFrom: an open data set whose rows the view may take over instead of reading, with
+    // the sort keys computed on them.
+    void openView(int viewKind, const char* statement, DataSet* rowsFrom = nullptr,
+                  GridController::FieldRanks ranks = {});
     void GetAndSetView();
     bool GetGridView(int& kind, int& percent) const;
     void SetGridView(int kind);
@@ -144,6 +169,7 @@ private:
     bool m_connected = false;
     bool m_deferSummary = false;
     bool m_refreshing = false;
+    bool m_changingView = false;
     int m_summaryRebuilds = 0;
     int m_percent = 60;
     QString m_currentLetter;
@@ -161,6 +187,7 @@ private:
     QWidget* m_toolbar = nullptr;
     QButtonGroup* m_letters = nullptr;
     GridView* m_view = nullptr;
+    GridCardView* m_cards = nullptr;
     QTimer* m_t1 = nullptr;
 
     QAction* m_newCont = nullptr;
@@ -168,6 +195,8 @@ private:
     QAction* m_deleteCont = nullptr;
     QMenu* m_popup = nullptr;
     GridColumnMenu* m_columnMenu = nullptr;
+    QMenu* m_cardPopup = nullptr;
+    GridColumnMenu* m_rowMenu = nullptr;
 };
 
 } // namespace orvanta

@@ -111,15 +111,45 @@ void DataSet::open()
 
 void DataSet::close()
 {
-    if (!m_active)
-        return;
+    if (m_active)
+        (void)takeRowsAndClose();
+}
+
+RecordStore DataSet::takeRowsAndClose()
+{
     Q_EMIT aboutToClose();
+    RecordStore rows = std::move(m_store);
     m_store.clear();
     m_active = false;
     m_row = -1;
     Q_EMIT closed();
     if (m_afterClose)
         m_afterClose(*this);
+    return rows;
+}
+
+bool DataSet::openWithRowsOf(DataSet& other)
+{
+    if (m_active || !other.m_active || &other == this || !paramNames().isEmpty())
+        return false;
+    if (m_beforeOpen)
+        m_beforeOpen(*this);
+    FbStatement statement(*m_attachment, m_transaction, m_commandText);
+    statement.prepare();
+    const QList<FbColumn>& theirs = other.m_store.fields();
+    if (statement.columnCount() != theirs.size())
+        return false;
+    for (int i = 0; i < statement.columnCount(); ++i) {
+        const FbColumn& a = statement.column(i);
+        const FbColumn& b = theirs[i];
+        if (a.name != b.name || a.type != b.type || a.width != b.width || a.scale != b.scale)
+            return false;
+    }
+    m_store = other.takeRowsAndClose();
+    m_active = true;
+    m_row = m_store.rowCount() > 0 ? 0 : -1;
+    Q_EMIT opened();
+    return true;
 }
 
 void DataSet::refresh()

@@ -77,6 +77,13 @@ public:
     // Throws DatabaseError (the data set then stays closed and empty).
     void open();
     void close();
+    // Opens with the rows the other (open) data set holds instead of reading them again, and
+    // closes that one: for two command texts that read the same rows, such as two names of one
+    // view. What can be checked without reading is: this text has no parameters and gives the
+    // same columns (name, type, width, scale) as the other's rows. The before-open hook runs as
+    // for open(), so a later refresh() reads a fresh snapshot. False, and nothing moved, when
+    // the check fails or the other is not open (or this one is). Throws DatabaseError.
+    bool openWithRowsOf(DataSet& other);
     // Close and open again: a new snapshot with the same text and parameters.
     void refresh();
     // Runs the command text as a statement that returns no rows (DELETE, UPDATE …) in the data
@@ -107,6 +114,9 @@ Q_SIGNALS:
     void closed();
 
 private:
+    // close(), handing the rows out instead of dropping them.
+    RecordStore takeRowsAndClose();
+
     FbAttachment* m_attachment;
     FbTransaction* m_transaction;
     QString m_commandText;

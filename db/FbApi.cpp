@@ -1,4 +1,5 @@
 #include "db/FbApi_p.h"
+#include "db/SharedEngine.h"
 
 #include <array>
 
@@ -55,3 +56,22 @@ DatabaseError toError(const FbException& e, const QString& context)
 }
 
 } // namespace orvanta::fbapi
+
+namespace orvanta {
+
+namespace {
+
+int refuseSignalShutdown(const int reason, const int /*mask*/, void* /*arg*/)
+{
+    return reason == fb_shutrsn_signal ? 1 : 0;
+}
+
+} // namespace
+
+void keepConnectionsOnTerminationSignals()
+{
+    ISC_STATUS_ARRAY status{};
+    fb_shutdown_callback(status, refuseSignalShutdown, fb_shut_confirmation, nullptr);
+}
+
+} // namespace orvanta

@@ -14,3 +14,13 @@ namespace orvanta {
 QString useSharedEmbeddedEngine();
 
 } // namespace orvanta
+
+namespace orvanta {
+
+// The client library catches SIGTERM and SIGINT and, on them, cuts every connection of the
+// process at once — before a program that handles those signals itself could end through its
+// own tear-down (which still stores its state). A program that handles them calls this; the
+// engine then shuts down when the program exits, as on a normal end.
+void keepConnectionsOnTerminationSignals();
+
+} // namespace orvanta

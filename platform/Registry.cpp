@@ -1,5 +1,7 @@
 #include "platform/Registry.h"
 
+#include "platform/ProgramFolder.h"
+
 #include <QDir>
 #include <QFile>
 #include <QFileInfo>
@@ -26,7 +28,12 @@ QString Registry::filePath(RegistryRoot root)
 {
     if (root == RegistryRoot::LocalMachine) {
         const QString path = qEnvironmentVariable("VARNIK_HKLM");
-        return path.isEmpty() ? QStringLiteral("/etc/xdg/Varnik/registry.ini") : path;
+        if (!path.isEmpty())
+            return path;
+        // An installation is one folder: the machine key beside the programs when there is one,
+        // so the program, the monitor and the settings program started from there agree.
+        const QString beside = programFile(QStringLiteral("registry.ini"));
+        return QFileInfo::exists(beside) ? beside : QStringLiteral("/etc/xdg/Varnik/registry.ini");
     }
     const QString path = qEnvironmentVariable("VARNIK_HKCU");
     return path.isEmpty() ? configHome() + QStringLiteral("/Varnik/registry.ini") : path;

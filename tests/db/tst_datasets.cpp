@@ -21,6 +21,7 @@ private Q_SLOTS:
     void openCloseHooksAndParams();
     void commandTextAndFieldByName();
     void failedOpenStaysClosed();
+    void openWithRowsOfAnother();
 };
 
 void TstDataSets::storeHoldsEveryTypeCompactly()
@@ -193,6 +194,79 @@ void TstDataSets::failedOpenStaysClosed()
     QCOMPARE(ds.rowCount(), 0);
     QVERIFY(ds.eof());
     QVERIFY(tx.isActive()); // the caller's handler decides about the transaction
+}
+
+// Two names of one view: the second takes the first's rows over without reading; anything that
+// could make the rows differ in shape reads instead.
+void TstDataSets::openWithRowsOfAnother()
+{
+    TempDatabase db(TempDatabase::Schema::Empty);
+    db.exec(QStringLiteral("CREATE TABLE T (ID INTEGER, V VARCHAR(10));"
+                           "CREATE VIEW V1 (ID, V) AS SELECT ID, V FROM T;"
+                           "CREATE VIEW V2 (ID, V) AS SELECT ID, V FROM T;"
+                           "CREATE VIEW V3 (ID, V) AS SELECT ID, CAST(V AS VARCHAR(20)) FROM T;"
+                           "INSERT INTO T VALUES (1, 'eins');"
+                           "INSERT INTO T VALUES (2, 'zwei');"));
+    FbAttachment& a = db.attachment();
+    FbTransaction t1(a);
+    FbTransaction t2(a);
+    QStringList hooks;
+    const auto hook = [&hooks](const char* what) {
+        return [&hooks, what](DataSet& d) {
+            hooks << d.name() + QLatin1Char(' ') + QLatin1String(what);
+            if (qstrcmp(what, "open") == 0) {
+                if (d.transaction()->isActive())
+                    d.transaction()->rollback();
+                d.transaction()->start();
+            } else if (d.transaction()->isActive()) {
+                d.transaction()->commit();
+            }
+        };
+    };
+    DataSet list(a, &t1, QStringLiteral("list"), QStringLiteral("SELECT * FROM V1 ORDER BY ID"));
+    DataSet cards(a, &t2, QStringLiteral("cards"), QStringLiteral("SELECT * FROM V2 ORDER BY ID"));
+    for (DataSet* d : {&list, &cards}) {
+        d->setBeforeOpen(hook("open"));
+        d->setAfterClose(hook("close"));
+    }
+    QVERIFY(!cards.openWithRowsOf(list)); // nothing open to take from
+    QVERIFY(!cards.isActive());
+    list.open();
+    // A row the first did not read: taking over keeps what was read.
+    db.exec(QStringLiteral("INSERT INTO T VALUES (3, 'drei');"));
+    hooks.clear();
+    QSignalSpy closing(&list, &DataSet::aboutToClose);
+    QVERIFY(cards.openWithRowsOf(list));
+    QVERIFY(cards.isActive());
+    QVERIFY(!list.isActive());
+    QCOMPARE(closing.count(), 1);
+    QCOMPARE(list.rowCount(), 0);
+    QCOMPARE(cards.rowCount(), 2);
+    QCOMPARE(cards.store().text(1, cards.fieldIndex(u"V")), QStringLiteral("zwei"));
+    QCOMPARE(cards.recNo(), 0);
+    QCOMPARE(hooks, (QStringList{"cards open", "list close"}));
+    QVERIFY(t2.isActive());
+    QVERIFY(!t1.isActive());
+    QVERIFY(list.openWithRowsOf(cards));
+    QCOMPARE(list.rowCount(), 2);
+    QVERIFY(list.isActive());
+    QVERIFY(!cards.isActive());
+    // A refresh reads afresh.
+    list.refresh();
+    QCOMPARE(list.rowCount(), 3);
+
+    // Other widths, or parameters, mean other rows: nothing is moved.
+    DataSet wide(a, &t2, QStringLiteral("wide"), QStringLiteral("SELECT * FROM V3 ORDER BY ID"));
+    wide.setBeforeOpen(hook("open"));
+    QVERIFY(!wide.openWithRowsOf(list));
+    QVERIFY(list.isActive());
+    QCOMPARE(list.rowCount(), 3);
+    DataSet param(a, &t2, QStringLiteral("param"), QStringLiteral("SELECT * FROM V2 WHERE ID > :ID"));
+    QVERIFY(!param.openWithRowsOf(list));
+    QVERIFY(list.isActive());
+    list.close();
+    if (t2.isActive())
+        t2.rollback();
 }
 
 ORVANTA_TEST(TstDataSets)

@@ -2,6 +2,7 @@
 // module, LibreOffice): every cell must equal what the grid shows.
 #include "export/writers/BiffWriter.h"
 #include "export/writers/ExportWriter.h"
+#include "tests/export/ExportReadBack.h"
 #include "tests/TestPaths.h"
 #include "tests/support/TestRegistry.h"
 #include "ui/grid/GridController.h"
@@ -19,8 +20,6 @@
 using namespace orvanta;
 
 namespace {
-
-using Table = QList<QStringList>;
 
 // Text the store cannot hold (it keeps ISO 8859-1) comes through a display-text column.
 const QStringList notes = {
@@ -63,81 +62,7 @@ struct Grid {
         }
         g.setSource(&src);
     }
-
-    // What the grid shows, read through the controller itself with every group expanded.
-    Table shown(const QStringList& excluded) const
-    {
-        QList<int> cols;
-        QStringList header;
-        for (const int c : g.visibleColumns()) {
-            if (!excluded.contains(g.column(c).name)) {
-                cols << c;
-                header << g.column(c).caption;
-            }
-        }
-        Table t{header};
-        const_cast<GridController&>(g).expandAll(true);
-        for (int r = 0; r < g.rowCount(); ++r) {
-            QStringList row;
-            for (int i = 0; i < cols.size(); ++i)
-                row << (g.isGroupRow(r) ? (i == 0 ? g.groupRowText(r) : QString()) : g.displayText(r, cols[i]));
-            t << row;
-        }
-        return t;
-    }
 };
-
-QString python()
-{
-    // The system interpreter, where the distribution's readers are installed.
-    return QFile::exists(QStringLiteral("/usr/bin/python3")) ? QStringLiteral("/usr/bin/python3") : QStringLiteral("python3");
-}
-
-QList<Table> readBack(const QString& kind, const QString& path)
-{
-    QProcess p;
-    p.start(python(), {QStringLiteral(ORVANTA_SOURCE_DIR "/tests/export/read_export.py"), kind, path});
-    if (!p.waitForFinished(120000) || p.exitCode() != 0) {
-        qWarning().noquote() << "reader failed:" << p.readAllStandardError();
-        return {};
-    }
-    QList<Table> tables;
-    for (const QJsonValue& t : QJsonDocument::fromJson(p.readAllStandardOutput()).array()) {
-        Table table;
-        for (const QJsonValue& r : t.toArray()) {
-            QStringList row;
-            for (const QJsonValue& c : r.toArray())
-                row << c.toString();
-            table << row;
-        }
-        tables << table;
-    }
-    return tables;
-}
-
-// XML and HTML cannot hold control characters other than tab and line breaks.
-QString markupSafe(QString s)
-{
-    for (QChar& ch : s) {
-        if (ch.unicode() < 0x20 && ch != u'\t' && ch != u'\n' && ch != u'\r')
-            ch = QChar(0xFFFD);
-    }
-    return s;
-}
-
-void compareTables(const Table& got, const Table& want, bool markup)
-{
-    QCOMPARE(got.size(), want.size());
-    for (int r = 0; r < want.size(); ++r) {
-        QCOMPARE(got[r].size(), want[r].size());
-        for (int c = 0; c < want[r].size(); ++c) {
-            const QString expected = markup ? markupSafe(want[r][c]) : want[r][c];
-            if (got[r][c] != expected)
-                QFAIL(qPrintable(QStringLiteral("row %1 column %2: got \"%3\", want \"%4\"")
-                                     .arg(r).arg(c).arg(got[r][c].left(60), expected.left(60))));
-        }
-    }
-}
 
 const QStringList excluded{QStringLiteral("cABID")};
 
@@ -175,12 +100,12 @@ private Q_SLOTS:
         GridSnapshot snapshot(grid.g, excluded);
         const ExportResult result = exportGrid(snapshot, f, path);
         QVERIFY2(result.ok, qPrintable(result.error));
-        const QList<Table> tables = readBack(exportExtension(f), path);
+        const QList<test::Table> tables = test::readBack(exportExtension(f), path);
         QCOMPARE(tables.size(), 1);
-        const Table want = grid.shown(excluded);
+        const test::Table want = test::shownTable(grid.g, excluded);
         // Hidden columns (the grouped one too) and ABID are not written.
         QCOMPARE(want.front().size(), grouped ? 3 : 4);
-        compareTables(tables.front(), want, f == ExportFormat::Html || f == ExportFormat::Xml);
+        test::compareTables(tables.front(), want, f == ExportFormat::Html || f == ExportFormat::Xml);
         QCOMPARE(result.rowsWritten, qint64(want.size() - 1));
     }
 
@@ -193,7 +118,7 @@ private Q_SLOTS:
         GridSnapshot snapshot(grid.g, excluded);
         QVERIFY(exportGrid(snapshot, ExportFormat::Excel, path).ok);
         QProcess p;
-        p.start(python(), {QStringLiteral("-c"),
+        p.start(test::python(), {QStringLiteral("-c"),
                            QStringLiteral("import sys, xlrd\n"
                                           "s = xlrd.open_workbook(sys.argv[1]).sheet_by_index(0)\n"
                                           "print(s.cell(1, 0).ctype, s.cell(1, 1).ctype, s.cell(1, 2).ctype, s.cell(1,0).value)"),
@@ -214,7 +139,7 @@ private Q_SLOTS:
         const QString path = dir.filePath(QStringLiteral("big.xls"));
         GridSnapshot snapshot(grid.g, excluded);
         QVERIFY(exportGrid(snapshot, ExportFormat::Excel, path).ok);
-        const QList<Table> tables = readBack(QStringLiteral("xls"), path);
+        const QList<test::Table> tables = test::readBack(QStringLiteral("xls"), path);
         QCOMPARE(tables.size(), 2);
         QCOMPARE(tables[0].size(), BiffWorkbook::maxRows);
         QCOMPARE(tables[1].size(), 1 + 10 + 1);
@@ -240,15 +165,15 @@ private Q_SLOTS:
                   dir.filePath(QStringLiteral("out")), path});
         QVERIFY2(lo.waitForFinished(240000), "LibreOffice (libreoffice-calc-nogui) did not finish");
         QCOMPARE(lo.exitCode(), 0);
-        const QList<Table> tables = readBack(QStringLiteral("txt"), dir.filePath(QStringLiteral("out/lo.csv")));
+        const QList<test::Table> tables = test::readBack(QStringLiteral("txt"), dir.filePath(QStringLiteral("out/lo.csv")));
         QCOMPARE(tables.size(), 1);
         // LibreOffice writes line breaks inside a cell as LF only.
-        Table want = grid.shown(excluded);
+        test::Table want = test::shownTable(grid.g, excluded);
         for (QStringList& row : want) {
             for (QString& cell : row)
                 cell.replace(QLatin1String("\r\n"), QLatin1String("\n"));
         }
-        compareTables(tables.front(), want, false);
+        test::compareTables(tables.front(), want, false);
     }
 
     // A failed or cancelled export leaves the target as it was and reports the failure.

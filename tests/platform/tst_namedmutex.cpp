@@ -1,6 +1,7 @@
 #include "platform/NamedMutex.h"
 #include "tests/support/TestRegistry.h"
 
+#include <QCoreApplication>
 #include <QTemporaryDir>
 #include <QDir>
 #include <QFileInfo>
@@ -121,9 +122,11 @@ private Q_SLOTS:
     {
         // Another user's lock in a folder all users share would end this user's start silently.
         qunsetenv("XDG_RUNTIME_DIR");
-        const QFileInfo folder(QFileInfo(NamedMutex::lockFilePath(QStringLiteral("Varnik Orvanta"))).path());
+        // A name of its own: the user's running program may hold "Varnik Orvanta" in that folder.
+        const QString name = QStringLiteral("Varnik Orvanta Test %1").arg(QCoreApplication::applicationPid());
+        const QFileInfo folder(QFileInfo(NamedMutex::lockFilePath(name)).path());
         {
-            NamedMutex held(QStringLiteral("Varnik Orvanta"));
+            NamedMutex held(name);
             QVERIFY(held.isOwned());
         }
         qputenv("XDG_RUNTIME_DIR", m_runtime.path().toUtf8());

@@ -1,3 +1,4 @@
+#include "platform/ProgramFolder.h"
 #include "platform/Registry.h"
 #include "tests/support/TestRegistry.h"
 
@@ -100,6 +101,11 @@ private Q_SLOTS:
         qunsetenv("VARNIK_HKCU");
         QCOMPARE(Registry::filePath(RegistryRoot::LocalMachine), QStringLiteral("/etc/xdg/Varnik/registry.ini"));
         QCOMPARE(Registry::filePath(RegistryRoot::CurrentUser), m_dir.filePath(QStringLiteral("config/Varnik/registry.ini")));
+        // An installation folder holding the machine key: it is used.
+        setProgramFolder(m_dir.path());
+        writeFile(m_dir.filePath(QStringLiteral("registry.ini")), "[Software]\r\n");
+        QCOMPARE(Registry::filePath(RegistryRoot::LocalMachine), m_dir.filePath(QStringLiteral("registry.ini")));
+        setProgramFolder({});
     }
 
     void autostartEntry()

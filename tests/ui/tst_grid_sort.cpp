@@ -231,6 +231,53 @@ private Q_SLOTS:
         QCOMPARE(g.focusedRecord(), 0);
     }
 
+    // Another view over the same rows takes the sort keys over instead of computing them; the
+    // giver computes its own again, a source of another size never takes foreign keys.
+    void sortKeysHandOverToAViewOfTheSameRows()
+    {
+        const auto src = makeSource({{QStringLiteral("b"), 2, {}}, {QStringLiteral("C"), 1, {}}, {QStringLiteral("a"), 3, {}}});
+        GridController table;
+        addColumns(table);
+        table.setSource(src.get());
+        table.setSortOrder(0, GridSortOrder::Ascending);
+        QCOMPARE(records(table), (QList<int>{2, 0, 1}));
+        GridController::FieldRanks ranks = table.takeFieldRanks();
+        QCOMPARE(ranks.size(), size_t(1)); // only what was computed: NAME
+        QCOMPARE(ranks.front().first, QStringLiteral("NAME"));
+
+        // The cards: same field under another column name, plus a column sorting by its own
+        // text, which must not take the field's keys.
+        const auto own = [](const GridSource&, quint32 row) {
+            return row == 0 ? QByteArrayView("z") : (row == 1 ? QByteArrayView("y") : QByteArrayView("x"));
+        };
+        GridController cards;
+        GridColumn computed(QStringLiteral("cardComputed"), QStringLiteral("NAME"));
+        computed.sortText = own;
+        cards.addColumn(computed);
+        cards.addColumn(GridColumn(QStringLiteral("cardName"), QStringLiteral("NAME")));
+        // A source of the same size with other texts shows that the keys are taken, not computed.
+        const auto other = makeSource({{QStringLiteral("x"), 0, {}}, {QStringLiteral("x"), 0, {}}, {QStringLiteral("x"), 0, {}}});
+        cards.setSource(other.get());
+        cards.adoptFieldRanks(ranks);
+        cards.setSortOrder(1, GridSortOrder::Ascending);
+        QCOMPARE(records(cards), (QList<int>{2, 0, 1}));
+        cards.setSortOrder(1, GridSortOrder::None);
+        cards.setSortOrder(0, GridSortOrder::Ascending);
+        QCOMPARE(records(cards), (QList<int>{2, 1, 0}));
+
+        const auto shorter = makeSource({{QStringLiteral("q"), 0, {}}, {QStringLiteral("p"), 0, {}}});
+        GridController small;
+        small.addColumn(GridColumn(QStringLiteral("n"), QStringLiteral("NAME")));
+        small.setSource(shorter.get());
+        small.adoptFieldRanks(ranks);
+        small.setSortOrder(0, GridSortOrder::Ascending);
+        QCOMPARE(records(small), (QList<int>{1, 0}));
+
+        table.reapply();
+        table.setSortOrder(0, GridSortOrder::Descending);
+        QCOMPARE(records(table), (QList<int>{1, 0, 2}));
+    }
+
     void refreshKeepsTheFocusedKey()
     {
         MemoryGridSource src({{QStringLiteral("LID"), GridFieldType::Integer}, {QStringLiteral("NAME"), GridFieldType::Text}});

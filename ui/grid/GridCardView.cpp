@@ -50,11 +50,8 @@ std::vector<int> pinFixed(const std::vector<int>& wanted, const std::vector<int>
 } // namespace
 
 GridCardView::GridCardView(QWidget* parent)
-    : QAbstractScrollArea(parent)
-    , m_controller(new GridController(this))
+    : GridViewBase(parent)
 {
-    setFocusPolicy(Qt::StrongFocus);
-    viewport()->setBackgroundRole(QPalette::Base);
     viewport()->setMouseTracking(false);
     // Always shown: the cards per column follow the viewport's height, so a scroll bar that came
     // and went with the card count would re-flow the cards it was shown for.
@@ -80,39 +77,20 @@ GridCardView::GridCardView(QWidget* parent)
         ensureCardVisible(current);
         viewport()->update();
     });
-    connect(m_controller, &GridController::focusedRecordChanged, this, &GridCardView::focusedRecordChanged);
 }
 
 GridCardView::~GridCardView() = default;
 
-int GridCardView::addColumn(GridColumn column)
+void GridCardView::columnAdded(int column)
 {
-    m_fixedRows.push_back(!column.movable);
-    return m_controller->addColumn(std::move(column));
+    m_fixedRows.resize(static_cast<size_t>(column) + 1, false);
+    m_fixedRows[static_cast<size_t>(column)] = !m_controller->column(column).movable;
 }
 
-void GridCardView::setSource(const GridSource* source)
+void GridCardView::updatesResumed()
 {
-    m_controller->setSource(source);
-}
-
-void GridCardView::beginUpdate()
-{
-    if (m_lock++ == 0)
-        viewport()->setUpdatesEnabled(false);
-    m_controller->beginUpdate();
-}
-
-void GridCardView::endUpdate()
-{
-    if (m_lock == 0)
-        return;
-    m_controller->endUpdate();
-    if (--m_lock == 0) {
-        viewport()->setUpdatesEnabled(true);
-        updateScrollBars();
-        viewport()->update();
-    }
+    updateScrollBars();
+    viewport()->update();
 }
 
 void GridCardView::setCardWidth(int width)
@@ -477,14 +455,6 @@ void GridCardView::mouseDoubleClickEvent(QMouseEvent* event)
         return;
     m_controller->setFocusedRow(card);
     Q_EMIT rowDoubleClicked(card);
-}
-
-void GridCardView::contextMenuEvent(QContextMenuEvent* event)
-{
-    const int card = cardAt(event->pos());
-    if (card >= 0)
-        m_controller->setFocusedRow(card);
-    Q_EMIT rowContextMenuRequested(event->globalPos());
 }
 
 // Up and Down step through the cards in their order (on into the next column), Left and Right

@@ -8,9 +8,8 @@
 // Cards have no grouping: a grouping set on the controller is undone. Only the cards on screen
 // are formatted and painted, so the record count does not matter for scrolling.
 
-#include "ui/grid/GridColumn.h"
+#include "ui/grid/GridViewBase.h"
 
-#include <QAbstractScrollArea>
 #include <QColor>
 #include <QList>
 #include <vector>
@@ -19,25 +18,13 @@ class QMenu;
 
 namespace orvanta {
 
-class GridController;
-class GridSource;
-
-class GridCardView final : public QAbstractScrollArea {
+class GridCardView final : public GridViewBase {
     Q_OBJECT
     Q_DISABLE_COPY_MOVE(GridCardView)
 
 public:
     explicit GridCardView(QWidget* parent = nullptr);
     ~GridCardView() override;
-
-    [[nodiscard]] GridController* controller() const { return m_controller; }
-
-    int addColumn(GridColumn column);
-    void setSource(const GridSource* source);
-
-    // Lock and unlock: changes in between are applied and painted once.
-    void beginUpdate();
-    void endUpdate();
 
     void setCardWidth(int width);
     [[nodiscard]] int cardWidth() const { return m_cardWidth; }
@@ -76,6 +63,7 @@ public:
     [[nodiscard]] int cardsPerColumn() const;
     [[nodiscard]] QRect cardRect(int row) const;
     [[nodiscard]] int cardAt(const QPoint& viewportPos) const;
+    [[nodiscard]] int displayRowAt(const QPoint& viewportPos) const override { return cardAt(viewportPos); }
     // Column of the line under the point on a card, -1 for the title or no line.
     [[nodiscard]] int rowAt(const QPoint& viewportPos) const;
     [[nodiscard]] QRect lineRect(int row, int column) const;
@@ -86,14 +74,9 @@ public:
     // Check items for the visible state of every row offered in a menu.
     void fillRowMenu(QMenu* menu);
 
-Q_SIGNALS:
-    void focusedRecordChanged();
-    void rowDoubleClicked(int row);
-    // Before the view handles a key: frames defer work on navigation keys or act on Delete.
-    void keyPressed(int key, Qt::KeyboardModifiers modifiers);
-    void rowContextMenuRequested(const QPoint& globalPos);
-
 protected:
+    void columnAdded(int column) override;
+    void updatesResumed() override;
     void paintEvent(QPaintEvent* event) override;
     void resizeEvent(QResizeEvent* event) override;
     void mousePressEvent(QMouseEvent* event) override;
@@ -101,7 +84,6 @@ protected:
     void mouseReleaseEvent(QMouseEvent* event) override;
     void mouseDoubleClickEvent(QMouseEvent* event) override;
     void keyPressEvent(QKeyEvent* event) override;
-    void contextMenuEvent(QContextMenuEvent* event) override;
     void scrollContentsBy(int dx, int dy) override;
     void wheelEvent(QWheelEvent* event) override;
 
@@ -113,12 +95,10 @@ private:
     void ensureCardVisible(int row);
     void paintCard(QPainter& p, int row, const QRect& rect, const std::vector<int>& lines, int labelWidth);
 
-    GridController* m_controller;
     std::vector<bool> m_fixedRows;
     int m_captionColumn = -1;
     int m_cardWidth = 300;
     int m_lineHeight = 16;
-    int m_lock = 0;
     QColor m_captionStart{0xFF, 0xFF, 0xFF};
     QColor m_captionEnd{0xD8, 0xD8, 0xD8};
     QColor m_captionText{0, 0, 0};

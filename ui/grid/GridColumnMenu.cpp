@@ -2,14 +2,13 @@
 
 #include "ui/grid/GridController.h"
 #include "ui/grid/GridUpdateLock.h"
-#include "ui/grid/GridView.h"
 
 #include <QAction>
 #include <QMenu>
 
 namespace orvanta {
 
-GridColumnMenu::GridColumnMenu(GridView* view, QMenu* popup, const QString& menuName, QObject* parent)
+GridColumnMenu::GridColumnMenu(GridViewBase* view, QMenu* popup, const QString& menuName, QObject* parent)
     : QObject(parent)
     , m_view(view)
     , m_menu(popup->addMenu(QStringLiteral("Ansicht")))
@@ -17,24 +16,9 @@ GridColumnMenu::GridColumnMenu(GridView* view, QMenu* popup, const QString& menu
     m_menu->setObjectName(menuName);
 }
 
-GridColumnMenu::GridColumnMenu(GridCardView* view, QMenu* popup, const QString& menuName, QObject* parent)
-    : QObject(parent)
-    , m_cards(view)
-    , m_menu(popup->addMenu(QStringLiteral("Ansicht")))
-{
-    m_menu->setObjectName(menuName);
-}
-
 GridController* GridColumnMenu::controller() const
 {
-    return m_view ? m_view->controller() : m_cards->controller();
-}
-
-GridUpdateLock GridColumnMenu::lockView() const
-{
-    if (m_view)
-        return GridUpdateLock(m_view);
-    return GridUpdateLock(m_cards);
+    return m_view->controller();
 }
 
 QAction* GridColumnMenu::addEntry(const QString& objectName, const QString& caption, int tag)
@@ -64,7 +48,7 @@ QAction* GridColumnMenu::entryByTag(int tag) const
 
 void GridColumnMenu::setColumnVisible(bool visible, int tag)
 {
-    const GridUpdateLock lock = lockView();
+    const GridUpdateLock lock(m_view);
     GridController* g = controller();
     const int c = g->columnByTag(tag);
     if (c >= 0)
@@ -73,7 +57,7 @@ void GridColumnMenu::setColumnVisible(bool visible, int tag)
 
 void GridColumnMenu::checkVisibleColumns()
 {
-    const GridUpdateLock lock = lockView();
+    const GridUpdateLock lock(m_view);
     const QSignalBlocker block(m_menu);
     const GridController* g = controller();
     for (const int c : g->visibleColumns()) {

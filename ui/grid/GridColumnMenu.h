@@ -13,10 +13,8 @@ class QMenu;
 
 namespace orvanta {
 
-class GridCardView;
 class GridController;
-class GridUpdateLock;
-class GridView;
+class GridViewBase;
 
 class GridColumnMenu final : public QObject {
     Q_OBJECT
@@ -24,8 +22,7 @@ class GridColumnMenu final : public QObject {
 
 public:
     // Appends the submenu "Ansicht" (objectName: menuName) to popup.
-    GridColumnMenu(GridView* view, QMenu* popup, const QString& menuName, QObject* parent = nullptr);
-    GridColumnMenu(GridCardView* view, QMenu* popup, const QString& menuName, QObject* parent = nullptr);
+    GridColumnMenu(GridViewBase* view, QMenu* popup, const QString& menuName, QObject* parent = nullptr);
 
     QAction* addEntry(const QString& objectName, const QString& caption, int tag);
     [[nodiscard]] QMenu* menu() const { return m_menu; }
@@ -45,10 +42,8 @@ public:
 
 private:
     [[nodiscard]] GridController* controller() const;
-    [[nodiscard]] GridUpdateLock lockView() const;
 
-    GridView* m_view = nullptr;
-    GridCardView* m_cards = nullptr;
+    GridViewBase* m_view;
     QMenu* m_menu;
     QList<QAction*> m_entries;
     std::function<void(QAction*)> m_onClick;

@@ -403,6 +403,37 @@ void GridController::endUpdate()
     }
 }
 
+GridController::FieldRanks GridController::takeFieldRanks()
+{
+    FieldRanks out;
+    for (int c = 0; c < columnCount(); ++c) {
+        const GridColumnState& s = m_columns[static_cast<size_t>(c)];
+        if (s.field < 0 || s.def.sortText)
+            continue;
+        GridRanks r = m_sorter.takeRanks(c);
+        if (r.valid)
+            out.emplace_back(s.def.fieldName, std::move(r));
+    }
+    return out;
+}
+
+void GridController::adoptFieldRanks(FieldRanks ranks)
+{
+    if (!m_source)
+        return;
+    for (auto& [field, r] : ranks) {
+        if (r.rank.size() != m_source->rowCount())
+            continue;
+        for (int c = 0; c < columnCount(); ++c) {
+            const GridColumnState& s = m_columns[static_cast<size_t>(c)];
+            if (s.field >= 0 && !s.def.sortText && s.def.fieldName.compare(field, Qt::CaseInsensitive) == 0) {
+                m_sorter.adoptRanks(c, r);
+                break;
+            }
+        }
+    }
+}
+
 void GridController::reapply()
 {
     m_sorter.invalidateRanks();

@@ -153,6 +153,15 @@ public:
     // Applies the filter, sort and grouping again over the unchanged source.
     void reapply();
 
+    // The sort ranks computed so far for columns that read a field as it is (no sortText), by
+    // field name; handed out, so this controller computes them again when it needs them.
+    using FieldRanks = std::vector<std::pair<QString, GridRanks>>;
+    [[nodiscard]] FieldRanks takeFieldRanks();
+    // Takes such ranks over for its own plain columns of the same fields. Only right after
+    // setSource() with a source that holds the very rows, in the very order, of the source the
+    // ranks were computed on: another view over the same fetched rows.
+    void adoptFieldRanks(FieldRanks ranks);
+
 Q_SIGNALS:
     // Rows changed: order, filter, grouping, expansion or source content.
     void layoutChanged();

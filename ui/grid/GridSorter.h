@@ -6,6 +6,7 @@
 
 #include "ui/grid/GridColumnState.h"
 
+#include <utility>
 #include <vector>
 
 namespace orvanta {
@@ -33,6 +34,9 @@ public:
     void addColumn() { m_ranks.emplace_back(); }
     void invalidateRanks();
     [[nodiscard]] const GridRanks& ranksOf(int c, const GridSource& source, const GridColumnStates& columns) const;
+    // Hands a column's ranks out (the slot is empty afterwards) or takes computed ones in.
+    [[nodiscard]] GridRanks takeRanks(int c) { return std::exchange(m_ranks[static_cast<size_t>(c)], GridRanks()); }
+    void adoptRanks(int c, GridRanks ranks) { m_ranks[static_cast<size_t>(c)] = std::move(ranks); }
 
     // Sorts order stably by the keys, each by its column's direction (ascending when none).
     void sort(std::vector<quint32>& order, const std::vector<int>& keys, const GridSource& source,

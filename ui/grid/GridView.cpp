@@ -76,15 +76,12 @@ std::vector<int> proportionalWidths(const std::vector<int>& weights, int total, 
 } // namespace
 
 GridView::GridView(QWidget* parent)
-    : QAbstractScrollArea(parent)
-    , m_controller(new GridController(this))
+    : GridViewBase(parent)
     , m_model(new GridModel(m_controller, this))
     , m_headerModel(new GridHeaderModel(m_controller, this))
     , m_header(new GridHeader(m_controller, this))
     , m_groupBox(new GridGroupBox(m_controller, this))
 {
-    setFocusPolicy(Qt::StrongFocus);
-    viewport()->setBackgroundRole(QPalette::Base);
     m_header->setModel(m_headerModel);
     m_header->setGroupByBox(m_groupBox);
     m_header->setStretchLastSection(true);
@@ -104,7 +101,6 @@ GridView::GridView(QWidget* parent)
         ensureRowVisible(current);
         viewport()->update();
     });
-    connect(m_controller, &GridController::focusedRecordChanged, this, &GridView::focusedRecordChanged);
 
     connect(m_header, &QHeaderView::sectionMoved, this, [this] {
         if (m_syncing)
@@ -151,34 +147,6 @@ GridView::GridView(QWidget* parent)
 }
 
 GridView::~GridView() = default;
-
-int GridView::addColumn(GridColumn column)
-{
-    return m_controller->addColumn(std::move(column));
-}
-
-void GridView::setSource(const GridSource* source)
-{
-    m_controller->setSource(source);
-}
-
-void GridView::beginUpdate()
-{
-    if (m_lock++ == 0)
-        viewport()->setUpdatesEnabled(false);
-    m_controller->beginUpdate();
-}
-
-void GridView::endUpdate()
-{
-    if (m_lock == 0)
-        return;
-    m_controller->endUpdate();
-    if (--m_lock == 0) {
-        viewport()->setUpdatesEnabled(true);
-        viewport()->update();
-    }
-}
 
 void GridView::setImages(QList<QPixmap> images)
 {
@@ -617,14 +585,6 @@ void GridView::mouseDoubleClickEvent(QMouseEvent* event)
         return;
     }
     Q_EMIT rowDoubleClicked(row);
-}
-
-void GridView::contextMenuEvent(QContextMenuEvent* event)
-{
-    const int row = rowAt(event->pos());
-    if (row >= 0)
-        m_controller->setFocusedRow(row);
-    Q_EMIT rowContextMenuRequested(event->globalPos());
 }
 
 void GridView::keyPressEvent(QKeyEvent* event)

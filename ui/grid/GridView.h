@@ -7,9 +7,8 @@
 // asks controller() for everything else; GridLayoutStore saves and restores what the user
 // changed.
 
-#include "ui/grid/GridColumn.h"
+#include "ui/grid/GridViewBase.h"
 
-#include <QAbstractScrollArea>
 #include <QPixmap>
 #include <functional>
 #include <vector>
@@ -18,12 +17,10 @@ class QMenu;
 
 namespace orvanta {
 
-class GridController;
 class GridGroupBox;
 class GridHeader;
 class GridHeaderModel;
 class GridModel;
-class GridSource;
 
 // What a custom cell painter gets to know about the cell it may paint.
 struct GridCellInfo {
@@ -37,7 +34,7 @@ struct GridCellInfo {
     QColor textColor;
 };
 
-class GridView final : public QAbstractScrollArea {
+class GridView final : public GridViewBase {
     Q_OBJECT
     Q_DISABLE_COPY_MOVE(GridView)
 
@@ -48,17 +45,9 @@ public:
     explicit GridView(QWidget* parent = nullptr);
     ~GridView() override;
 
-    [[nodiscard]] GridController* controller() const { return m_controller; }
     [[nodiscard]] GridModel* model() const { return m_model; }
     [[nodiscard]] GridHeader* header() const { return m_header; }
     [[nodiscard]] GridGroupBox* groupByBox() const { return m_groupBox; }
-
-    int addColumn(GridColumn column);
-    void setSource(const GridSource* source);
-
-    // Lock and unlock: changes in between are applied and painted once.
-    void beginUpdate();
-    void endUpdate();
 
     void setImages(QList<QPixmap> images);
     [[nodiscard]] const QList<QPixmap>& images() const { return m_images; }
@@ -87,6 +76,7 @@ public:
     // Viewport geometry of a row, empty when it is scrolled out.
     [[nodiscard]] QRect rowRect(int row) const;
     [[nodiscard]] int rowAt(const QPoint& viewportPos) const;
+    [[nodiscard]] int displayRowAt(const QPoint& viewportPos) const override { return rowAt(viewportPos); }
     [[nodiscard]] QRect cellRect(int row, int column) const;
     [[nodiscard]] int firstVisibleRow() const;
     void scrollToRow(int row);
@@ -95,11 +85,6 @@ public:
     void fillColumnMenu(QMenu* menu);
 
 Q_SIGNALS:
-    void focusedRecordChanged();
-    void rowDoubleClicked(int row);
-    // Before the view handles a key: frames defer work on navigation keys or act on Delete.
-    void keyPressed(int key, Qt::KeyboardModifiers modifiers);
-    void rowContextMenuRequested(const QPoint& globalPos);
     void columnDraggedOut(int column);
 
 protected:
@@ -109,7 +94,6 @@ protected:
     void mouseReleaseEvent(QMouseEvent* event) override;
     void mouseDoubleClickEvent(QMouseEvent* event) override;
     void keyPressEvent(QKeyEvent* event) override;
-    void contextMenuEvent(QContextMenuEvent* event) override;
     void scrollContentsBy(int dx, int dy) override;
     void changeEvent(QEvent* event) override;
 
@@ -131,7 +115,6 @@ private:
     void paintDataRow(QPainter& p, int row, const QRect& rect, bool focused);
     void showHeaderMenu(const QPoint& pos);
 
-    GridController* m_controller;
     GridModel* m_model;
     GridHeaderModel* m_headerModel;
     GridHeader* m_header;
@@ -143,7 +126,6 @@ private:
     QColor m_groupColor;
     int m_rowHeight = 18;
     int m_headerHeight = 21;
-    int m_lock = 0;
     bool m_syncing = false;
     bool m_autoWidth = false;
     bool m_widthsPending = false;

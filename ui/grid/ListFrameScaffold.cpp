@@ -1,5 +1,6 @@
 #include "ui/grid/ListFrameScaffold.h"
 
+#include "ui/grid/GridCardView.h"
 #include "ui/grid/GridView.h"
 #include "ui/label/TVKCutLabel.h"
 #include "ui/scheme/ColorScheme.h"
@@ -63,20 +64,35 @@ void ListFrameScaffold::addPanel(QFrame* panel)
     m_panels.append(panel);
 }
 
+void ListFrameScaffold::ensureGridHost()
+{
+    if (m_gridHost)
+        return;
+    m_gridHost = new QWidget(m_fp3);
+    m_gridHost->setObjectName(QStringLiteral("cxGrid1"));
+    auto* gl = new QVBoxLayout(m_gridHost);
+    gl->setContentsMargins(0, 0, 0, 0);
+    m_box->addWidget(m_gridHost, 1);
+}
+
 GridView* ListFrameScaffold::addTableView(const QString& objectName)
 {
-    if (!m_gridHost) {
-        m_gridHost = new QWidget(m_fp3);
-        m_gridHost->setObjectName(QStringLiteral("cxGrid1"));
-        auto* gl = new QVBoxLayout(m_gridHost);
-        gl->setContentsMargins(0, 0, 0, 0);
-        m_box->addWidget(m_gridHost, 1);
-    }
+    ensureGridHost();
     auto* view = new GridView(m_gridHost);
     view->setObjectName(objectName);
     view->setGridLineColor(kGridLines);
     m_gridHost->layout()->addWidget(view);
     m_views.append(view);
+    return view;
+}
+
+GridCardView* ListFrameScaffold::addCardView(const QString& objectName)
+{
+    ensureGridHost();
+    auto* view = new GridCardView(m_gridHost);
+    view->setObjectName(objectName);
+    m_gridHost->layout()->addWidget(view);
+    m_cardViews.append(view);
     return view;
 }
 
@@ -98,6 +114,12 @@ void ListFrameScaffold::applyColorScheme(int scheme)
     for (GridView* view : m_views) {
         view->setGroupRowColor(c.panel);
         view->setGridLineColor(kGridLines);
+    }
+    // Titles of cards without focus: the footer's gradient with the scheme's text colour; the
+    // focused card keeps the view's own colours.
+    for (GridCardView* view : m_cardViews) {
+        view->setCaptionColors(c.footerStart, c.footerEnd, c.cardTitleText);
+        view->setBorderColor(c.footerBorder);
     }
 }
 

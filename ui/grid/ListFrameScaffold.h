@@ -1,7 +1,8 @@
 #pragma once
 // The chrome every list frame shares (call log, contact list): the bordered panel FP3 that
 // fills the frame, the caption strip RzSeparator2 with the label CL1, strips of the frame's own
-// below it (the search panel), and the grid host cxGrid1 holding the frame's views. It colours
+// below it (the search panel), and the grid host cxGrid1 holding the frame's views (tables and
+// card views). It colours
 // all of them by the list-frame colour table, so a frame configures what it shows and nothing
 // of how it looks.
 
@@ -13,6 +14,7 @@ class QWidget;
 
 namespace orvanta {
 
+class GridCardView;
 class GridView;
 class TVKCutLabel;
 
@@ -27,6 +29,8 @@ public:
     void addPanel(QFrame* panel);
     // A table view in the grid host, which takes the rest of the frame's height.
     GridView* addTableView(const QString& objectName);
+    // A card view in the grid host; the cards' titles take the scheme's colours.
+    GridCardView* addCardView(const QString& objectName);
 
     [[nodiscard]] QFrame* panel() const { return m_fp3; }
     [[nodiscard]] QFrame* captionBar() const { return m_captionBar; }
@@ -36,6 +40,8 @@ public:
     void applyColorScheme(int scheme);
 
 private:
+    void ensureGridHost();
+
     QFrame* m_fp3;
     QVBoxLayout* m_box;
     QFrame* m_captionBar;
@@ -43,6 +49,7 @@ private:
     QWidget* m_gridHost = nullptr;
     QList<QFrame*> m_panels;
     QList<GridView*> m_views;
+    QList<GridCardView*> m_cardViews;
 };
 
 } // namespace orvanta

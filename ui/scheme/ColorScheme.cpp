@@ -110,4 +110,14 @@ const PrintWindowColors& printWindowColors(int scheme)
     return entryOf(printWindowTable(), scheme);
 }
 
+const EditorDialogColors& editorDialogColors(int scheme)
+{
+    static const SchemeTable<EditorDialogColors> table{{
+        {colorFromBgr(0xF9DAC3), colorFromBgr(0x962D00), colorFromBgr(0xF5BFA0), colorFromBgr(0x10AFF9)},
+        {colorFromBgr(0xE4F0F2), colorFromBgr(0x588060), colorFromBgr(0xAADADA), colorFromBgr(0x10AFF9)},
+        {colorFromBgr(0xF7F3F3), colorFromBgr(0x987C80), colorFromBgr(0xE6D8D8), colorFromBgr(0x10AFF9)},
+    }};
+    return entryOf(table, scheme);
+}
+
 } // namespace orvanta

@@ -70,4 +70,14 @@ struct PrintWindowColors {
 
 [[nodiscard]] const PrintWindowColors& printWindowColors(int scheme);
 
+// The number and e-mail editors' colours.
+struct EditorDialogColors {
+    QColor panel;
+    QColor border;          // panel border, edit and check-box frames
+    QColor buttonHighlight;
+    QColor headerStart;     // header band gradient start
+};
+
+[[nodiscard]] const EditorDialogColors& editorDialogColors(int scheme);
+
 } // namespace orvanta
