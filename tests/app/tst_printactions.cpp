@@ -3,6 +3,7 @@
 #include "app/MainWindowFeatures.h"
 #include "app/TLogform.h"
 #include "calllog/TLogPrintSelection.h"
+#include "contacts/ContactNoteEditor.h"
 #include "contacts/Tcontactlistframe.h"
 #include "tests/TestPaths.h"
 #include "tests/app/AppTestEnv.h"
@@ -14,6 +15,7 @@
 #include <QPushButton>
 #include <QRadioButton>
 #include <QTest>
+#include <QTextEdit>
 #include <QTimer>
 
 using namespace orvanta;
@@ -90,6 +92,33 @@ private Q_SLOTS:
         overview->trigger();
         QCOMPARE(capture.titles, QStringList{QStringLiteral("Vorschau Kontaktübersicht")});
         QVERIFY(capture.text().contains(QStringLiteral("Zorn")));
+    }
+
+    void theEditWindowsNotePrintsThroughTheNoteReport()
+    {
+        test::AppTestEnv env;
+        std::vector<MainWindowFeature> f = defaultMainWindowFeatures();
+        f.push_back(test::plainWindows());
+        TLogform& w = env.window({}, f);
+        w.show();
+        test::ReportCapture capture;
+        ContactNoteEditor editor;
+        editor.setDesignation([] { return QStringLiteral("Bäckerei Schön"); });
+        editor.editor()->setPlainText(QStringLiteral("Brötchen für Montag bestellen."));
+        QAction* print = editor.findChild<QAction*>(QStringLiteral("dxBB3"));
+        QVERIFY(print);
+
+        print->trigger(); // no report file yet
+        QCOMPARE(capture.count(), 0);
+        QCOMPARE(env.dialogs().count(), 1);
+        QVERIFY(env.dialogs().last().text.startsWith(QStringLiteral("Methode: NotizDruck\r\nError: UNEXPECTED\r\n")));
+
+        env.writeFile(QStringLiteral("Orvex.rav"), shippedReports());
+        print->trigger();
+        QCOMPARE(capture.titles, QStringList{QStringLiteral("Vorschau Notiz")});
+        QVERIFY(capture.text().contains(QStringLiteral("Bäckerei Schön")));
+        QVERIFY(capture.text().contains(QStringLiteral("Brötchen für Montag bestellen.")));
+        QCOMPARE(env.dialogs().count(), 1);
     }
 };
 
