@@ -4,6 +4,7 @@
 #include "app/TLogform.h"
 #include "calllog/LogMaintenance.h"
 #include "calllog/TLogDetailForm.h"
+#include "calllog/TLogPrintSelection.h"
 #include "calllog/Tlogframe.h"
 #include "ui/navbar/AdvNavBar.h"
 
@@ -64,6 +65,13 @@ void OpenLogBemerkungExecute(TLogform& w)
     w.CreateLogDetailFo(lid);
 }
 
+// The print selection, modal; it runs the report itself.
+void PrintExecute(TLogform& w)
+{
+    TLogPrintSelection selection(w.dataModule(), &w);
+    selection.exec();
+}
+
 } // namespace
 
 void registerCallLogFeature(TLogform& w)
@@ -81,7 +89,7 @@ void registerCallLogFeature(TLogform& w)
 
     ActionRegistry& actions = w.actions();
     const auto ready = [&w] { return logFrameReady(w); };
-    actions.define(QStringLiteral("_LogFo_Print"), [&w] { w.forwardToFrame(QStringLiteral("_LogFo_Print")); }, ready);
+    actions.define(QStringLiteral("_LogFo_Print"), [&w] { PrintExecute(w); }, ready);
     actions.define(QStringLiteral("_LogFo_DelLog"), [&w] { DelLogExecute(w); }, ready);
     actions.define(QStringLiteral("_LogFo_DelDayLog"), [&w] { DelDayLogExecute(w); },
                    [&w] { return logFrameReady(w) && w.navBar()->activeTabIndex() == TLogform::TabCalendar; });

@@ -3,7 +3,11 @@
 #include "app/AppServices.h"
 #include "app/TLogform.h"
 #include "contacts/ContactDeletion.h"
+#include "contacts/ContactReports.h"
+#include "contacts/Tcontacteditform.h"
 #include "contacts/Tcontactlistframe.h"
+#include "db/TDM2.h"
+#include "platform/ErrorLog.h"
 
 namespace orvanta {
 
@@ -42,6 +46,14 @@ void ContDelExecute(TLogform& w)
         f->Refresh_View(0);
 }
 
+void PrintContactOverviewExecute(TLogform& w)
+{
+    TDM2* dm = w.dataModule();
+    ReportOutcome outcome;
+    if (!DruckKontaktUebersicht(dm ? &dm->rave_ibsql : nullptr, outcome))
+        reportError(reportFailureEntry(QStringLiteral("DruckKontaktUebersicht"), outcome));
+}
+
 } // namespace
 
 void registerContactsFeature(TLogform& w)
@@ -52,6 +64,19 @@ void registerContactsFeature(TLogform& w)
     };
     w.actions().define(QStringLiteral("_LogFo_ContDel"), [&w] { ContDelExecute(w); },
                        [&w] { return contactChosen(w); });
+    w.actions().define(QStringLiteral("_LogFo_PrintContactOverview"), [&w] { PrintContactOverviewExecute(w); },
+                       [&w] { return w.contactFrame() && w.contactFrame()->isConnected(); });
+    // The edit window's note prints as the notes window's does; the window reports a failure.
+    Tcontacteditform::setNotePrinter([](const QString& designation, const QByteArray& rtf) {
+        ReportOutcome outcome;
+        NotePrintResult result;
+        if (!NotizDruck(designation, rtf, outcome)) {
+            result.code = reportResultName(outcome.code);
+            result.number = int(outcome.number);
+            result.message = outcome.message;
+        }
+        return result;
+    });
 }
 
 } // namespace orvanta

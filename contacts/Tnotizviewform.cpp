@@ -1,5 +1,6 @@
 #include "contacts/Tnotizviewform.h"
 
+#include "contacts/ContactReports.h"
 #include "contacts/ContactStatements.h"
 #include "db/TDM2.h"
 #include "platform/ErrorLog.h"
@@ -26,9 +27,18 @@ QPointer<Tnotizviewform>& theInstance()
 
 const QString kLabel = QStringLiteral("# Notizanzeige - GetNotizData\r\n");
 
+bool printNote(const QString& designation, const QByteArray& rtf)
+{
+    ReportOutcome outcome;
+    if (NotizDruck(designation, rtf, outcome))
+        return true;
+    reportError(reportFailureEntry(QStringLiteral("NotizDruck"), outcome));
+    return false;
+}
+
 Tnotizviewform::NotePrinter& printer()
 {
-    static Tnotizviewform::NotePrinter p;
+    static Tnotizviewform::NotePrinter p = printNote;
     return p;
 }
 
@@ -116,7 +126,7 @@ Tnotizviewform* Tnotizviewform::showNote(TDM2* dm, int lid)
 
 void Tnotizviewform::setNotePrinter(NotePrinter p)
 {
-    printer() = std::move(p);
+    printer() = p ? std::move(p) : printNote;
 }
 
 void Tnotizviewform::RzB2Click()

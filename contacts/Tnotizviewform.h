@@ -31,7 +31,7 @@ public:
     static void closeInstance();
 
     // Prints a note: the designation and the note's RTF; false when printing failed (the printer
-    // reports its own errors). Until the printing is installed "Drucken" prints nothing.
+    // reports its own errors). By default the note report in the preview; an empty one restores it.
     using NotePrinter = std::function<bool(const QString& designation, const QByteArray& rtf)>;
     static void setNotePrinter(NotePrinter printer);
 

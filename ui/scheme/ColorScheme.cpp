@@ -56,6 +56,16 @@ const SchemeTable<DetailWindowColors>& detailWindowTable()
     return table;
 }
 
+const SchemeTable<PrintWindowColors>& printWindowTable()
+{
+    static const SchemeTable<PrintWindowColors> table{{
+        {colorFromBgr(16640730), colorFromBgr(14986888), colorFromBgr(16572875), colorFromBgr(9841920), 2},
+        {colorFromBgr(13627626), colorFromBgr(9224369), colorFromBgr(15003890), colorFromBgr(5800032), 3},
+        {colorFromBgr(15524577), colorFromBgr(11769496), colorFromBgr(15524577), colorFromBgr(9993344), 4},
+    }};
+    return table;
+}
+
 } // namespace
 
 int normalizedColorScheme(int value)
@@ -93,6 +103,11 @@ const ListFrameColors& listFrameColors(int scheme)
 const DetailWindowColors& detailWindowColors(int scheme)
 {
     return entryOf(detailWindowTable(), scheme);
+}
+
+const PrintWindowColors& printWindowColors(int scheme)
+{
+    return entryOf(printWindowTable(), scheme);
 }
 
 const EditorDialogColors& editorDialogColors(int scheme)

@@ -59,6 +59,17 @@ struct DetailWindowColors {
 
 [[nodiscard]] const DetailWindowColors& detailWindowColors(int scheme);
 
+// The print selection's and the print dialog's colours (decimal Windows colour values).
+struct PrintWindowColors {
+    QColor gradientFrom; // title band, left to right
+    QColor gradientTo;
+    QColor window;
+    QColor accent; // panel borders, shapes, radio-button frames, button borders
+    int buttonStyle;
+};
+
+[[nodiscard]] const PrintWindowColors& printWindowColors(int scheme);
+
 // The number and e-mail editors' colours.
 struct EditorDialogColors {
     QColor panel;

@@ -1,0 +1,192 @@
+#include "calllog/LogReport.h"
+
+#include "db/DatabaseError.h"
+#include "db/FbStatement.h"
+#include "db/FbTransaction.h"
+#include "ui/report/ReportRun.h"
+
+#include <QLocale>
+
+namespace orvanta {
+
+namespace {
+
+constexpr LogReportVariant kVariants[] = {
+    {"LogEinfach", "RvCustomConnectionLogEinfach", "order by TSDATE, TSTIME"},
+    {"LogDetailliert", "RvCustomConnectionLogDetailliert", "order by TSDATE, TSTIME"},
+    {"LogEinfachGruppeDatum", "RvCustomConnectionLogEinfach", "order by TSDATE, TSTIME"},
+    {"LogDetailliertGruppeDatum", "RvCustomConnectionLogDetailliert", "order by TSDATE, TSTIME"},
+    {"LogEinfachGruppeVerbindung", "RvCustomConnectionLogEinfach", "order by CTYPE, TSDATE, TSTIME"},
+    {"LogDetailliertGruppeVerbindung", "RvCustomConnectionLogDetailliert", "order by CTYPE, TSDATE, TSTIME"},
+    {"LogEinfachGruppeOriginating", "RvCustomConnectionLogEinfach", "order by FROMBEZ, REGION, TSDATE, TSTIME"},
+    {"LogDetailliertGruppeOriginating", "RvCustomConnectionLogDetailliert", "order by FROMBEZ, REGION, TSDATE, TSTIME"},
+    {"LogEinfachGruppeTerminating", "RvCustomConnectionLogEinfach", "order by ONBEZ, TSDATE, TSTIME"},
+    {"LogDetailliertGruppeTerminating", "RvCustomConnectionLogDetailliert", "order by ONBEZ, TSDATE, TSTIME"},
+};
+
+const char* const kSimpleSelect = "select TSDate, TSTime, CTYPE, FROMBEZ, STATUS, ONBEZ from LOG ";
+const char* const kDetailedSelect =
+    "select TSDate, TSTime, CTYPE, FROMBEZ, STATUS, ONBEZ, CTIME, CCHARGE, BEMERK, ABID, REGION from LOG ";
+
+bool detailed(int variant)
+{
+    return variant % 2 == 1;
+}
+
+QString shortDate(QDate date)
+{
+    return date.toString(QStringLiteral("dd.MM.yyyy"));
+}
+
+} // namespace
+
+const LogReportVariant* logReportVariant(int variant)
+{
+    return variant >= 0 && variant < 10 ? &kVariants[variant] : nullptr;
+}
+
+LogReportQuery logReportQuery(int variant, QDate start, QDate end)
+{
+    LogReportQuery query;
+    QString where;
+    if (!start.isValid()) {
+        query.zeitraum = QStringLiteral("(alles)");
+    } else if (!end.isValid()) {
+        where = QStringLiteral("where TSDATE = :Day ");
+        query.params.append({QStringLiteral("Day"), start});
+        query.zeitraum = QLatin1Char('(') + shortDate(start) + QLatin1Char(')');
+    } else {
+        where = QStringLiteral("where (TSDATE >= :StartDay) and (TSDATE <= :EndDay) ");
+        query.params.append({QStringLiteral("StartDay"), start});
+        query.params.append({QStringLiteral("EndDay"), end});
+        query.zeitraum = QLatin1Char('(') + shortDate(start) + QLatin1Char('-') + shortDate(end) + QLatin1Char(')');
+    }
+    const LogReportVariant* v = logReportVariant(variant);
+    query.sql = QLatin1String(detailed(variant) ? kDetailedSelect : kSimpleSelect) + where
+        + (v ? QLatin1String(v->order) : QLatin1String());
+    return query;
+}
+
+LogReportConnection::LogReportConnection(FbStatement& statement, LogReportQuery query, int variant)
+    : m_statement(statement)
+    , m_query(std::move(query))
+    , m_variant(variant)
+{
+}
+
+QList<ReportField> LogReportConnection::fields() const
+{
+    auto field = [](const char* name, int width) {
+        const QString n = QLatin1String(name);
+        return ReportField{n, width, QStringLiteral("Feld ") + n};
+    };
+    QList<ReportField> list{field("Datum", 16),  field("Zeit", 11),   field("Verbindung", 11),
+                            field("Anrufer", 81), field("Status", 41), field("Angerufener", 81)};
+    if (detailed(m_variant))
+        list += {field("Dauer", 16), field("Kosten", 16), field("Bemerkung", 51), field("Anrufbeantworter", 26),
+                 field("Region", 36)};
+    list.append(field("Odd", 1));
+    return list;
+}
+
+void LogReportConnection::open()
+{
+    m_statement.close();
+    FbTransaction* transaction = m_statement.transaction();
+    if (transaction->isActive())
+        transaction->commit();
+    m_statement.setSql(m_query.sql);
+    m_counter = 0;
+    if (!transaction->isActive())
+        transaction->start();
+    for (const auto& [name, value] : std::as_const(m_query.params))
+        m_statement.setParam(name, value);
+    m_statement.execute();
+    m_hasRow = m_statement.next();
+}
+
+bool LogReportConnection::atEnd() const
+{
+    return !m_hasRow;
+}
+
+QString LogReportConnection::durationText(qint64 seconds)
+{
+    const QString separator = QStringLiteral(":");
+    return QString::number(seconds / 3600) + separator + QStringLiteral("%1").arg(seconds / 60 % 60, 2, 10, QLatin1Char('0'))
+        + separator + QStringLiteral("%1").arg(seconds % 60, 2, 10, QLatin1Char('0'));
+}
+
+QStringList LogReportConnection::row() const
+{
+    const FbStatement& s = m_statement;
+    QStringList values;
+    values << (s.isNull(0) ? QString() : shortDate(s.asDate(0)));
+    values << (s.isNull(1) ? QString() : s.asTime(1).toString(QStringLiteral("hh:mm")));
+    values << (s.asInt(2) != 0 ? QStringLiteral("abgehend") : QStringLiteral("ankommend"));
+    values << s.asString(3) << s.asString(4) << s.asString(5);
+    if (detailed(m_variant)) {
+        values << (s.isNull(6) ? durationText(0) : durationText(QTime(0, 0).secsTo(s.asTime(6))));
+        const QLocale locale = QLocale::system();
+        values << locale.toCurrencyString(double(s.asScaled(7, 2)) / 100, locale.currencySymbol(), 2);
+        values << s.asString(8);
+        values << (s.asInt(9) != 0 ? QStringLiteral("Mitteilung vorhanden") : QString());
+        const QString region = s.asString(10);
+        values << (m_variant == 7 && !region.isEmpty() ? QStringLiteral(" (") + region + QLatin1Char(')') : region);
+    }
+    values << (m_counter % 2 == 0 ? QStringLiteral("T") : QStringLiteral("F"));
+    return values;
+}
+
+void LogReportConnection::next()
+{
+    ++m_counter;
+    m_hasRow = m_statement.next();
+}
+
+void LogReportConnection::restore()
+{
+    FbTransaction* transaction = m_statement.transaction();
+    if (transaction && transaction->isActive())
+        transaction->commit();
+    m_statement.close();
+}
+
+bool LogPrint(FbStatement* statement, int variant, ReportOutcome& outcome, QDate end, QDate start)
+{
+    outcome = ReportOutcome{};
+    if (!statement) {
+        outcome.code = int(ReportResult::NO_QUERY_AVAILABLE);
+        return false;
+    }
+    if (!statement->transaction()) {
+        outcome.code = int(ReportResult::NO_TRANSACTION_AVAILABLE);
+        return false;
+    }
+    const LogReportVariant* v = logReportVariant(variant);
+    if (!v) {
+        outcome.code = int(ReportResult::NO_REPORT_ASSIGNED);
+        return false;
+    }
+    try {
+        LogReportQuery query = logReportQuery(variant, start, end);
+        ReportParameters parameters;
+        parameters.text.insert(QStringLiteral("Zeitraum"), query.zeitraum);
+        LogReportConnection connection(*statement, std::move(query), variant);
+        runReport(QLatin1String(v->report), std::move(parameters), &connection, QStringLiteral("Vorschau Anrufprotokoll"));
+    } catch (const DatabaseError& e) {
+        outcome.code = int(ReportResult::UNEXPECTED);
+        outcome.number = e.ibErrorCode();
+        outcome.message = e.message();
+        statement->close();
+        statement->transaction()->rollbackQuietly();
+        return false;
+    } catch (const std::exception& e) {
+        outcome.code = int(ReportResult::UNEXPECTED);
+        outcome.message = QString::fromUtf8(e.what());
+        return false;
+    }
+    return true;
+}
+
+} // namespace orvanta
