@@ -637,15 +637,9 @@ QByteArray writeVCards(const QList<VCardContact>& cards)
             typed("TEL", phone);
         for (const VCardTyped& mail : card.emails)
             typed("EMAIL", mail);
-        for (const QString& url : card.urls) {
-            // Commas and semicolons are part of an address on the web; only what ends a line or
-            // would be read as an escape is escaped.
-            QString value = url;
-            value.replace(QLatin1Char('\\'), QLatin1String("\\\\"));
-            value.replace(QLatin1Char('\n'), QLatin1String("\\n"));
-            value.remove(QLatin1Char('\r'));
-            appendLine(out, QStringLiteral("URL:") + value);
-        }
+        // Escaped like text, as common readers expect of a web address with a comma.
+        for (const QString& url : card.urls)
+            appendLine(out, QStringLiteral("URL:") + escapeText(url));
         if (!card.note.isEmpty())
             appendLine(out, QStringLiteral("NOTE:") + escapeText(card.note));
         if (!card.categories.isEmpty())

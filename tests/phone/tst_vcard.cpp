@@ -160,7 +160,7 @@ private Q_SLOTS:
         QVERIFY(out.contains("\r\nN:Müller;Jürgen;;Dr.;\r\n"));
         QVERIFY(out.contains("\r\nORG:Müller\\; Söhne\\, KG\r\n"));
         QVERIFY(out.contains("\r\nitem1.TEL;TYPE=work,voice:+49 30 123456\r\nitem1.X-ABLabel:Büro\\, 2. Stock\r\n"));
-        QVERIFY(out.contains("\r\nURL:https://example.de/a,b;c\r\n"));
+        QVERIFY(out.contains("\r\nURL:https://example.de/a\\,b\\;c\r\n"));
         QVERIFY(out.contains("\r\nCATEGORIES:Kunden,A\\,B\r\n"));
         QVERIFY(out.contains("NOTE:Zeile 1\\nZeile 2 mit \\\\ und "));
         QCOMPARE(out.count("BEGIN:VCARD"), 2);
