@@ -8,6 +8,19 @@
 
 namespace orvanta {
 
+QString displayName(const VCardContact& card)
+{
+    QStringList words;
+    for (const QString& part : {card.givenName, card.additionalNames, card.familyName, card.suffix}) {
+        if (!part.trimmed().isEmpty())
+            words << part.trimmed();
+    }
+    // A salutation or title alone names nobody.
+    if (!words.isEmpty() && !card.prefix.trimmed().isEmpty())
+        words.prepend(card.prefix.trimmed());
+    return words.isEmpty() ? card.organization.trimmed() : words.join(QLatin1Char(' '));
+}
+
 bool VCardContact::isEmpty() const
 {
     const bool named = !formattedName.trimmed().isEmpty() || !familyName.trimmed().isEmpty()
@@ -377,13 +390,8 @@ void Reader::finishCard(int line, bool sawEnd)
         ++m_result.skippedCards;
         m_result.messages << QStringLiteral("Zeile %1: Karte ohne Namen und Nummern übersprungen").arg(m_cardLine);
     } else {
-        if (m_card.formattedName.trimmed().isEmpty()) {
-            const QString name = QStringList{m_card.prefix, m_card.givenName, m_card.additionalNames,
-                                             m_card.familyName, m_card.suffix}
-                                     .filter(QRegularExpression(QStringLiteral("\\S")))
-                                     .join(QLatin1Char(' '));
-            m_card.formattedName = name.isEmpty() ? m_card.organization : name;
-        }
+        if (m_card.formattedName.trimmed().isEmpty())
+            m_card.formattedName = displayName(m_card);
         m_result.cards << m_card;
     }
     m_inCard = false;

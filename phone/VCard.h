@@ -58,6 +58,10 @@ struct VCardContact {
     friend bool operator==(const VCardContact&, const VCardContact&) = default;
 };
 
+// The name a card without FN is shown by: prefix, given, additional and family name and suffix,
+// else the organisation.
+[[nodiscard]] QString displayName(const VCardContact& card);
+
 struct VCardReadResult {
     QList<VCardContact> cards;
     // One German line per thing passed over or repaired ("Zeile 7: …"), in file order.
