@@ -25,7 +25,8 @@ OEImpWindow::FileChooser& chooserSeam()
     return chooser;
 }
 
-enum Column { Designation, Name, Given, Company, Numbers, Mails, Town, Category, Notes, Result, ColumnCount };
+// The result next to the designation, where it stays in sight however wide the rest is.
+enum Column { Designation, Result, Name, Given, Company, Numbers, Mails, Town, Category, Notes, ColumnCount };
 
 QString numbersOf(const TvkMiniKontakt& c)
 {
@@ -73,11 +74,11 @@ OEImpWindow::OEImpWindow(TDM2& dm, int homeCountry, QWidget* parent)
     auto* split = new QSplitter(Qt::Vertical, this);
     m_preview = new QTableWidget(0, ColumnCount, split);
     m_preview->setObjectName(QStringLiteral("tblPreview"));
-    m_preview->setHorizontalHeaderLabels({QStringLiteral("Bezeichnung"), QStringLiteral("Name"),
+    m_preview->setHorizontalHeaderLabels({QStringLiteral("Bezeichnung"), QStringLiteral("Ergebnis"), QStringLiteral("Name"),
                                           QStringLiteral("Vorname"), QStringLiteral("Firma"),
                                           QStringLiteral("Telefon"), QStringLiteral("E-Mail"),
                                           QStringLiteral("PLZ/Ort"), QStringLiteral("Kategorie"),
-                                          QStringLiteral("Hinweise"), QStringLiteral("Ergebnis")});
+                                          QStringLiteral("Hinweise")});
     m_preview->setEditTriggers(QAbstractItemView::NoEditTriggers);
     m_preview->setSelectionBehavior(QAbstractItemView::SelectRows);
     m_preview->verticalHeader()->setVisible(false);
@@ -141,9 +142,25 @@ bool OEImpWindow::openFile(const QString& path)
         m_import->setEnabled(false);
         return false;
     }
-    QString text = QStringLiteral("%1 Kontakte werden angelegt.").arg(m_plan.contacts.size());
+    // Marked beforehand, so the preview shows what the import will really create.
+    int present = 0;
+    if (m_connected) {
+        ContactImporter importer(m_dm);
+        for (int row = 0; row < m_plan.contacts.size(); ++row) {
+            if (importer.isPresent(m_plan.contacts.at(row).contact)) {
+                m_preview->item(row, Result)->setText(QStringLiteral("schon vorhanden"));
+                ++present;
+            }
+        }
+    }
+    const auto count = [](qsizetype n, const char* one, const char* many) {
+        return QStringLiteral("%1 %2").arg(n).arg(QString::fromUtf8(n == 1 ? one : many));
+    };
+    QString text = count(m_plan.contacts.size() - present, "Kontakt wird angelegt.", "Kontakte werden angelegt.");
+    if (present > 0)
+        text += QLatin1Char(' ') + count(present, "ist schon vorhanden.", "sind schon vorhanden.");
     if (m_plan.skipped > 0)
-        text += QStringLiteral(" %1 Einträge der Datei sind keine Kontakte.").arg(m_plan.skipped);
+        text += QLatin1Char(' ') + count(m_plan.skipped, "Eintrag der Datei ist kein Kontakt.", "Einträge der Datei sind keine Kontakte.");
     m_summary->setText(m_connected ? text : QStringLiteral("Keine Verbindung zur Datenbank – ein Import ist nicht möglich."));
     m_import->setEnabled(m_connected && !m_plan.contacts.isEmpty());
     m_progress->setRange(0, std::max<int>(1, int(m_plan.contacts.size())));
@@ -160,9 +177,9 @@ void OEImpWindow::fillPreview()
     for (int row = 0; row < m_plan.contacts.size(); ++row) {
         const CardImport& entry = m_plan.contacts.at(row);
         const TvkMiniKontakt& c = entry.contact;
-        const QString cells[ColumnCount] = {c.CONTBEZ(), c.NAME(), c.VNAME(), c.FIRMA(), numbersOf(c), mailsOf(c),
+        const QString cells[ColumnCount] = {c.CONTBEZ(), QString(), c.NAME(), c.VNAME(), c.FIRMA(), numbersOf(c), mailsOf(c),
                                             QStringList{c.PLZ(), c.ORT()}.join(QLatin1Char(' ')).trimmed(),
-                                            c.KATBEZ(), entry.notes.join(QStringLiteral("; ")), QString()};
+                                            c.KATBEZ(), entry.notes.join(QStringLiteral("; "))};
         for (int col = 0; col < ColumnCount; ++col)
             m_preview->setItem(row, col, new QTableWidgetItem(cells[col]));
         for (const QString& note : entry.notes)
@@ -171,6 +188,7 @@ void OEImpWindow::fillPreview()
     m_preview->resizeColumnsToContents();
     for (int col = 0; col < ColumnCount; ++col)
         m_preview->setColumnWidth(col, std::min(m_preview->columnWidth(col), 260));
+    m_preview->setColumnWidth(Result, 170);
 }
 
 void OEImpWindow::runImport()
