@@ -270,6 +270,7 @@ CardImport contactFromCard(const VCardContact& card, int homeCountry)
         note = note.isEmpty() ? noteLines.join(QLatin1Char('\n')) : note + QLatin1Char('\n') + noteLines.join(QLatin1Char('\n'));
     if (!note.isEmpty())
         c.StoreNotes(note.split(QLatin1Char('\n')), note);
+    out.noteText = note;
     return out;
 }
 

@@ -33,6 +33,9 @@ struct CardImport {
     TvkMiniKontakt contact; // every number and address New
     // German notes on what did not fit ("2. Adresse nicht übernommen", values cut to width).
     QStringList notes;
+    // The whole note as text; the record holds it in the Windows code page, which not every
+    // character has (the caller may store it as rich text instead).
+    QString noteText;
 };
 [[nodiscard]] CardImport contactFromCard(const VCardContact& card, int homeCountry);
 

@@ -11,6 +11,7 @@
 #include "tests/support/ProgramTestEnv.h"
 #include "tests/support/TestRegistry.h"
 #include "tools/oeimp/OEImpWindow.h"
+#include "ui/rtf/RtfReader.h"
 
 #include <QLabel>
 #include <QListWidget>
@@ -18,6 +19,7 @@
 #include <QPushButton>
 #include <QTableWidget>
 #include <QTest>
+#include <QTextDocument>
 
 using namespace orvanta;
 using namespace orvanta::oeimp;
@@ -177,6 +179,26 @@ private Q_SLOTS:
         QCOMPARE(child<QListWidget>(w, "lstMessages")->item(0)->text(),
                  QStringLiteral("Zeile 1: 1 Zeilen außerhalb einer Karte übersprungen"));
         QCOMPARE(env.db().scalar(QStringLiteral("SELECT COUNT(*) FROM CONTACT")).toInt(), 0);
+    }
+
+    // A note with characters the code page lacks is stored as rich text and loses none of them.
+    void keepsEveryCharacterOfANote()
+    {
+        ProgramTestEnv env(testNow(), ProgramTestEnv::ErrorLogSetup::Create);
+        const QString note = QStringLiteral("Grüße aus 北京 🙂\nzweite Zeile");
+        QVERIFY(env.writeFile(QStringLiteral("notiz.vcf"),
+                              "BEGIN:VCARD\r\nVERSION:4.0\r\nFN:Li Wei\r\nNOTE:"
+                                  + QString(note).replace(QLatin1Char('\n'), QLatin1String("\\n")).toUtf8()
+                                  + "\r\nEND:VCARD\r\n"));
+        OEImpWindow w(env.dm(), 1);
+        QVERIFY(w.openFile(env.file(QStringLiteral("notiz.vcf"))));
+        w.runImport();
+        QCOMPARE(w.importedCount(), 1);
+        const QByteArray stored = storedContacts(env).constFirst().notes();
+        QVERIFY(RtfReader::isRtf(stored));
+        QTextDocument doc;
+        QVERIFY(RtfReader::read(stored, &doc));
+        QCOMPARE(doc.toPlainText(), note);
     }
 
     void importsOutlookCsv()

@@ -4,9 +4,12 @@
 #include "db/TDM2.h"
 #include "db/TransactionWork.h"
 #include "phone/ContactCsv.h"
+#include "platform/Windows1252.h"
+#include "ui/rtf/RtfWriter.h"
 
 #include <QFile>
 #include <QFileInfo>
+#include <QTextDocument>
 
 namespace orvanta::oeimp {
 
@@ -43,8 +46,17 @@ ImportPlan readImportFile(const QString& path, int homeCountry)
     const VCardReadResult read = csv ? readContactCsv(bytes) : readVCards(bytes);
     plan.messages = read.messages;
     plan.skipped = read.skippedCards;
-    for (const VCardContact& card : read.cards)
-        plan.contacts << contactFromCard(card, homeCountry);
+    for (const VCardContact& card : read.cards) {
+        CardImport entry = contactFromCard(card, homeCountry);
+        // Characters the code page lacks would become "?": such a note is kept as rich text,
+        // which the note window and the export read like any other.
+        if (!entry.noteText.isEmpty() && fromWindows1252(toWindows1252(entry.noteText)) != entry.noteText) {
+            QTextDocument doc;
+            doc.setPlainText(entry.noteText);
+            entry.contact.StoreNotes(RtfWriter::write(doc), entry.noteText);
+        }
+        plan.contacts << std::move(entry);
+    }
     if (plan.contacts.isEmpty() && plan.skipped == 0 && plan.messages.isEmpty())
         plan.error = csv ? QStringLiteral("Die Datei enthält keine Kontakte.")
                          : QStringLiteral("Die Datei enthält keine vCard.");
