@@ -122,17 +122,19 @@ NumberParts splitDialledNumber(QStringView written, int homeCountry)
     if (national.startsWith(QLatin1Char('0')))
         national.remove(0, 1);
     parts.LC = QStringLiteral("00") + country;
+    // After a country code the area code has no trunk zero, as the edit window stores a number
+    // it splits: "0049" "30" "6148273" is what a caller's international number matches.
     if (const int mobile = mobilePrefixLength(country, national); mobile > 0 && national.size() > mobile) {
-        parts.VORW = QLatin1Char('0') + national.left(mobile);
+        parts.VORW = national.left(mobile);
         parts.NUMBER = national.mid(mobile);
         return parts;
     }
     QString prefix, rest;
-    if (lookup(country, QLatin1Char('0') + national, prefix, rest) && !prefix.isEmpty()) {
+    if (lookup(country, national, prefix, rest) && !prefix.isEmpty()) {
         parts.VORW = prefix;
         parts.NUMBER = rest;
     } else {
-        parts.NUMBER = QLatin1Char('0') + national;
+        parts.NUMBER = national;
     }
     return parts;
 }

@@ -12,7 +12,7 @@
 namespace orvanta {
 
 // A written number split as the contact record stores it: "+49 30 6148273", "0049-30-6148273"
-// and (home country Germany) "030 6148273" all give LC "0049", VORW "030", NUMBER "6148273".
+// and (home country Germany) "030 6148273" all give LC "0049", VORW "30", NUMBER "6148273".
 // Numbers of other countries keep their international form in NUMBER; a number whose area code
 // is not listed keeps all its digits in NUMBER. homeCountry: 1 Germany, 2 Austria, 3 Switzerland.
 struct NumberParts {

@@ -119,8 +119,8 @@ private Q_SLOTS:
         auto* preview = child<QTableWidget>(w, "tblPreview");
         QCOMPARE(preview->rowCount(), 3);
         QCOMPARE(preview->item(0, 0)->text(), QStringLiteral("Jürgen Müller"));
-        QCOMPARE(preview->item(0, 5)->text(), QStringLiteral("Telefon geschäftlich: 0049 030 6148273; Handy: 0049 0171 4471123"));
-        QCOMPARE(preview->item(1, 5)->text(), QStringLiteral("Telefon privat: 0049 089 2389011"));
+        QCOMPARE(preview->item(0, 5)->text(), QStringLiteral("Telefon geschäftlich: 0049 30 6148273; Handy: 0049 171 4471123"));
+        QCOMPARE(preview->item(1, 5)->text(), QStringLiteral("Telefon privat: 0049 89 2389011"));
         QCOMPARE(child<QLabel>(w, "lblSummary")->text(),
                  QStringLiteral("3 Kontakte werden angelegt. 1 Eintrag der Datei ist kein Kontakt."));
         QStringList messages;
@@ -147,7 +147,7 @@ private Q_SLOTS:
         // The category did not exist: it was created and the contact put into it.
         QCOMPARE(j.KATBEZ(), QStringLiteral("Lieferanten"));
         QCOMPARE(j.KD().size(), 2);
-        QCOMPARE(j.KD().at(1).VORW, QStringLiteral("0171"));
+        QCOMPARE(j.KD().at(1).VORW, QStringLiteral("171"));
         QCOMPARE(j.Mail().constFirst().MAILADDR, QStringLiteral("j@mueller.example"));
         QCOMPARE(fromWindows1252(j.notes()), QStringLiteral("Ruft gern\r\nvormittags an\r\n"));
 
@@ -165,6 +165,46 @@ private Q_SLOTS:
         QCOMPARE(preview->item(0, 1)->text(), QStringLiteral("übersprungen (schon vorhanden)"));
         QCOMPARE(env.db().scalar(QStringLiteral("SELECT COUNT(*) FROM CONTACT")).toInt(), 4);
         QCOMPARE(env.db().scalar(QStringLiteral("SELECT COUNT(*) FROM KAT")).toInt(), 1);
+    }
+
+    // A contact stored with the trunk zero after its country code ("0049" "089") is the same
+    // number as "+49 89 …" and is found; a different designation is another contact.
+    void findsNumbersStoredInEitherForm()
+    {
+        ProgramTestEnv env(testNow(), ProgramTestEnv::ErrorLogSetup::Create);
+        env.db().exec(QStringLiteral("INSERT INTO CONTACT (LID, CONTBEZ) VALUES (1000, 'Schmidt, Anna')"));
+        env.db().exec(QStringLiteral("INSERT INTO COM (LID, CID, KOMMBEZ, LC, VORW, NUMBER, VORWNUMBER, LCVORWNUMBER, "
+                                     "NUMBEROF) VALUES (1000, 1000, 'Telefon', '0049', '089', '2389011', '892389011', "
+                                     "'490892389011', '2389011')"));
+        QVERIFY(env.writeFile(QStringLiteral("anna.vcf"),
+                              "BEGIN:VCARD\r\nVERSION:3.0\r\nFN:schmidt, anna\r\nTEL:+49 89 2389011\r\nEND:VCARD\r\n"
+                              "BEGIN:VCARD\r\nVERSION:3.0\r\nFN:Schmidt, Anne\r\nTEL:089 2389011\r\nEND:VCARD\r\n"));
+        OEImpWindow w(env.dm(), 1);
+        QVERIFY(w.openFile(env.file(QStringLiteral("anna.vcf"))));
+        w.runImport();
+        QCOMPARE(child<QLabel>(w, "lblSummary")->text(), QStringLiteral("1 importiert, 1 übersprungen, 0 fehlerhaft"));
+        QCOMPARE(env.db().scalar(QStringLiteral("SELECT COUNT(*) FROM COM")).toInt(), 2);
+    }
+
+    // A contact whose number the database refuses is not stored at all, and the rest goes on.
+    void aFailedContactLeavesNothingBehind()
+    {
+        ProgramTestEnv env(testNow(), ProgramTestEnv::ErrorLogSetup::Create);
+        // The next number key is taken, so storing the first card's number fails.
+        env.db().exec(QStringLiteral("INSERT INTO CONTACT (LID, CONTBEZ) VALUES (1000, 'Vorhanden')"));
+        env.db().exec(QStringLiteral("INSERT INTO COM (LID, CID, NUMBER) VALUES (1, 1000, '1')"));
+        QVERIFY(env.writeFile(QStringLiteral("zwei.vcf"),
+                              "BEGIN:VCARD\r\nFN:Mit Nummer\r\nADR:;;Weg 1;Ort;;12345;\r\nTEL:030 1234\r\nEND:VCARD\r\n"
+                              "BEGIN:VCARD\r\nFN:Ohne Nummer\r\nEMAIL:o@n.example\r\nEND:VCARD\r\n"));
+        OEImpWindow w(env.dm(), 1);
+        QVERIFY(w.openFile(env.file(QStringLiteral("zwei.vcf"))));
+        w.runImport();
+        QCOMPARE(child<QLabel>(w, "lblSummary")->text(), QStringLiteral("1 importiert, 0 übersprungen, 1 fehlerhaft"));
+        auto* messages = child<QListWidget>(w, "lstMessages");
+        QCOMPARE(messages->item(messages->count() - 1)->text(), QStringLiteral("Mit Nummer: konnte nicht gespeichert werden"));
+        QCOMPARE(env.db().scalar(QStringLiteral("SELECT COUNT(*) FROM CONTACT WHERE CONTBEZ = 'Mit Nummer'")).toInt(), 0);
+        QCOMPARE(env.db().scalar(QStringLiteral("SELECT COUNT(*) FROM ADDR WHERE STR = 'Weg 1'")).toInt(), 0);
+        QCOMPARE(env.db().scalar(QStringLiteral("SELECT COUNT(*) FROM CONTACT WHERE CONTBEZ = 'Ohne Nummer'")).toInt(), 1);
     }
 
     void reportsUnreadableFiles()
@@ -217,7 +257,7 @@ private Q_SLOTS:
         const QList<TvkMiniKontakt> stored = storedContacts(env);
         QCOMPARE(stored.at(0).CONTBEZ(), QStringLiteral("Frau Erika Meier"));
         QCOMPARE(stored.at(0).ORT(), QStringLiteral("Köln"));
-        QCOMPARE(stored.at(0).KD().constFirst().VORW, QStringLiteral("0221"));
+        QCOMPARE(stored.at(0).KD().constFirst().VORW, QStringLiteral("221"));
         QCOMPARE(fromWindows1252(stored.at(0).notes()), QStringLiteral("zwei\r\nZeilen\r\n"));
         QCOMPARE(stored.at(1).KD().constFirst().KOMMBEZ, QStringLiteral("Handy"));
     }
@@ -246,9 +286,9 @@ private Q_SLOTS:
             a.setLAND(QStringLiteral("Deutschland"));
             a.setBUNDESLAND(QStringLiteral("Berlin"));
             a.setKATBEZ(QStringLiteral("Kunden"));
-            a.AddKD(number("Telefon", "0049", "030", "6148273"));
-            a.AddKD(number("Handy", "0049", "0171", "4471123"));
-            a.AddKD(number("Fax Zentrale", "0043", "0316", "12345"));
+            a.AddKD(number("Telefon", "0049", "30", "6148273"));
+            a.AddKD(number("Handy", "0049", "171", "4471123"));
+            a.AddKD(number("Fax Zentrale", "0043", "316", "12345"));
             TvkMailItem mail;
             mail.MAILADDR = QStringLiteral("j@mueller.example");
             mail.BEMERK = QStringLiteral("Büro");
@@ -259,7 +299,7 @@ private Q_SLOTS:
             TvkMiniKontakt b;
             b.setCONTBEZ(QStringLiteral("Straßenbau AG"));
             b.setFIRMA(QStringLiteral("Straßenbau AG"));
-            b.AddKD(number("Telefon privat", "0041", "044", "1234567"));
+            b.AddKD(number("Telefon privat", "0041", "44", "1234567"));
             QVERIFY(InsertConData(env.dm(), &a));
             QVERIFY(InsertConData(env.dm(), &b));
 
