@@ -1,6 +1,7 @@
 #include "app/ContactsFeature.h"
 
 #include "app/AppServices.h"
+#include "app/ContactVCardExport.h"
 #include "app/TLogform.h"
 #include "contacts/ContactDeletion.h"
 #include "contacts/ContactReports.h"
@@ -60,7 +61,9 @@ void registerContactsFeature(TLogform& w)
 {
     TDM2* dm = w.dataModule();
     w.factories().contactFrame = [dm](QWidget* parent) -> ContactListFrame* {
-        return new Tcontactlistframe(dm, parent);
+        auto* frame = new Tcontactlistframe(dm, parent);
+        addVCardExport(*frame, dm);
+        return frame;
     };
     w.actions().define(QStringLiteral("_LogFo_ContDel"), [&w] { ContDelExecute(w); },
                        [&w] { return contactChosen(w); });

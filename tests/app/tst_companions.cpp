@@ -16,12 +16,12 @@ class TestCompanions : public QObject {
     Q_OBJECT
 
 private Q_SLOTS:
-    void setupAndInfoProgramsAreFoundAndRun()
+    void companionProgramsAreFoundAndRun()
     {
         test::ProgramTestEnv env(QDateTime(QDate(2024, 5, 15), QTime(12, 0)), test::ProgramTestEnv::ErrorLogSetup::None);
         ProgramLauncher launcher;
         launcher.setStartFolder(QStringLiteral(ORVANTA_BIN_DIR "/"));
-        for (const char* name : {"AppSetup", "About"}) {
+        for (const char* name : {"AppSetup", "About", "OEImp"}) {
             const QString program = launcher.resolve(QLatin1String(name) + QStringLiteral(".exe"));
             QCOMPARE(program, QStringLiteral(ORVANTA_BIN_DIR "/") + QLatin1String(name));
             QVERIFY(QFileInfo(program).isExecutable());
