@@ -540,6 +540,9 @@ void TstLogFrame::searchFindsNarrowsClearsAndCloses()
     chooseColumns(f, {QStringLiteral("Datum")});
     search(f, QStringLiteral("14.05."));
     QCOMPARE(lids(f), (QList<int>{3, 8, 2}));
+    chooseColumns(f, {QStringLiteral("Zeit")});
+    search(f, QStringLiteral("12:00:0"));
+    QCOMPARE(lids(f), (QList<int>{7, 8, 9, 10}));
     chooseColumns(f, {QStringLiteral("Status"), QStringLiteral("An")});
     search(f, QStringLiteral("Meier"));
     QCOMPARE(lids(f), QList<int>{});
@@ -554,8 +557,12 @@ void TstLogFrame::searchFindsNarrowsClearsAndCloses()
              QStringList(2, GridSearchPanel::missingInputWarning()));
     QCOMPARE(lids(f), QList<int>{});
 
-    // With a period filter: the search replaces it, or narrows it with RzChB1.
+    // With a period filter: the search replaces it, or narrows it with RzChB1. A period chosen
+    // while a search replaces the filter makes the search narrow it.
     f.SetNewFilter(2);
+    QVERIFY(f.findChild<QCheckBox*>(QStringLiteral("RzChB1"))->isChecked());
+    QVERIFY(f.controller()->search().narrow);
+    check(f, "RzChB1", false);
     search(f, QStringLiteral("Meier"));
     QCOMPARE(lids(f), (QList<int>{3, 1}));
     QCOMPARE(f.captionText(), QStringLiteral("Anrufprotokoll (Suche: \"Meier\")"));

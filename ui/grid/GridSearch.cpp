@@ -71,6 +71,14 @@ GridSearchMatcher::GridSearchMatcher(const GridSearch& search, const GridSource&
         gridcollation::appendSearchFold(raw, m_needle);
     else
         m_needle = raw;
+    // The bytes a match can begin in (also inside a two-letter character): a cell with none of
+    // them is passed over without folding it.
+    if (m_fold && !m_needle.isEmpty()) {
+        const FoldTable& t = foldTable();
+        const char first = m_needle.front();
+        for (size_t c = 0; c < 256; ++c)
+            m_canStart[c] = t.bytes[c][0] == first || (t.length[c] == 2 && t.bytes[c][1] == first);
+    }
     for (const int c : search.columns) {
         if (c < 0 || static_cast<size_t>(c) >= columns.size())
             continue;
@@ -82,6 +90,10 @@ GridSearchMatcher::GridSearchMatcher(const GridSearch& search, const GridSource&
         col.perValue = !col.bytes && !s.def.displayText && !s.def.sortText && s.field >= 0;
         if (!col.bytes && !col.perValue && !s.def.displayText)
             continue; // no field, no text: nothing to find
+        // The field's type is read once: a source may work to answer it.
+        const GridFieldType type = col.perValue ? source.fieldType(s.field) : GridFieldType::Text;
+        col.time = type == GridFieldType::Time;
+        col.isDouble = type == GridFieldType::Double;
         m_columns.push_back(col);
     }
     m_valueHits.resize(m_columns.size());
@@ -100,6 +112,15 @@ bool GridSearchMatcher::matchesText(QByteArrayView text) const
     }
     // Folding at most doubles a text; one that cannot reach the needle's length is out early.
     if (static_cast<size_t>(text.size()) * 2 < needle.size())
+        return false;
+    bool candidate = false;
+    for (const char ch : text) {
+        if (m_canStart[static_cast<unsigned char>(ch)]) {
+            candidate = true;
+            break;
+        }
+    }
+    if (!candidate)
         return false;
     const FoldTable& t = foldTable();
     if (m_buffer.size() < static_cast<size_t>(text.size()) * 2)
@@ -129,6 +150,26 @@ bool GridSearchMatcher::matches(quint32 row) const
                 return true;
             continue;
         }
+        if (col.time) {
+            // Times have too many values to format each once: "hh:mm:ss" is written here directly.
+            if (!m_source.isNull(row, s.field)) {
+                const qint64 ms = m_source.intValue(row, s.field);
+                if (ms >= 0 && ms < gridvalue::msPerDay) {
+                    const auto secs = static_cast<int>(ms / 1000);
+                    const int parts[3] = {secs / 3600, secs / 60 % 60, secs % 60};
+                    char text[8];
+                    for (int i = 0; i < 3; ++i) {
+                        text[i * 3] = static_cast<char>('0' + parts[i] / 10);
+                        text[i * 3 + 1] = static_cast<char>('0' + parts[i] % 10);
+                        if (i < 2)
+                            text[i * 3 + 2] = ':';
+                    }
+                    if (matchesText(QByteArrayView(text, 8)))
+                        return true;
+                    continue;
+                }
+            }
+        }
         if (col.perValue) {
             if (m_source.isNull(row, s.field)) {
                 if (m_nullHit[i] < 0) {
@@ -139,7 +180,7 @@ bool GridSearchMatcher::matches(quint32 row) const
                     return true;
                 continue;
             }
-            const qint64 value = m_source.fieldType(s.field) == GridFieldType::Double
+            const qint64 value = col.isDouble
                                      ? std::bit_cast<qint64>(m_source.doubleValue(row, s.field))
                                      : m_source.intValue(row, s.field);
             // Neighbouring rows often share a value (the calls of one day).

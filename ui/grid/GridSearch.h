@@ -7,12 +7,13 @@
 // Without caseSensitive the comparison folds both sides as gridcollation::searchFold does (case,
 // and "ß" as "ss"), so "strasse" finds "Straße" and "müller" finds "Müller", but "muller" does
 // not. Text columns are searched in the bytes they sort by; other columns in their display text,
-// formatted once per distinct value.
+// formatted once per distinct value (times, with a value per second, as they are met).
 
 #include "ui/grid/GridColumnState.h"
 
 #include <QByteArray>
 #include <QString>
+#include <array>
 #include <unordered_map>
 #include <vector>
 
@@ -48,6 +49,8 @@ private:
         const GridColumnState* state = nullptr;
         bool bytes = false;     // searched in its key bytes
         bool perValue = false;  // display text depends on the field value alone
+        bool time = false;      // a plain time: formatted on the spot
+        bool isDouble = false;
     };
 
     const GridSource& m_source;
@@ -56,6 +59,7 @@ private:
     bool m_exact = false;
     bool m_fold = true;
     bool m_impossible = false;
+    std::array<bool, 256> m_canStart{};
     mutable std::vector<char> m_buffer;
     // Per column, the answer for each value already seen (non-text columns).
     mutable std::vector<std::unordered_map<qint64, bool>> m_valueHits;
