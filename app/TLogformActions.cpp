@@ -97,6 +97,9 @@ void TLogform::buildActions()
         add(f.name, QString::fromUtf8(f.caption), [this, name] { forwardToFrame(name); },
             [this, name] { return frameAllows(name); });
     }
+    // The search entries show whether the list's search panel is open.
+    for (const char* name : {"_LogFo_Search", "_LogFo_LogSearch"})
+        action(QString::fromLatin1(name))->setCheckable(true);
 
     add("dxBB_Ansicht_Proto", QStringLiteral("Protokoll"), [this] { selectPanelFromMenu(TabLog); });
     add("dxBB_Ansicht_Proto_PK", QStringLiteral("Protokoll per Kalender"), [this] { selectPanelFromMenu(TabCalendar); });
@@ -220,6 +223,12 @@ void TLogform::updateActions()
     if (m_tornDown)
         return;
     m_actions.update();
+    const bool searching = (m_logFrame && m_logFrame->isSearchShown()) || (m_contactFrame && m_contactFrame->isSearchShown());
+    for (const char* name : {"_LogFo_Search", "_LogFo_LogSearch"}) {
+        QAction* a = action(QString::fromLatin1(name));
+        if (a->isChecked() != searching)
+            a->setChecked(searching);
+    }
 }
 
 void TLogform::runIfEnabled(const QString& actionName)

@@ -95,7 +95,12 @@ void TLogform::dispatchMessage(int message, qintptr wParam, qintptr lParam)
     case WMCLOSELOGDETAILFORM: WMCLOSELOGDETAILFORM_(wParam); break;
     case WMDELETELOGITEM: runIfEnabled(QStringLiteral("_LogFo_DelLog")); break;
     case WMBRINGTOFRONT: bringToFront(this); break;
-    default: break; // WMEXPORTGAUGE, WMSEARCHUNCHECKED, WMOPENCONTACTPERLOG, voice box: no effect
+    case WMSEARCHUNCHECKED:
+        // A list closed its search panel: the entries that show it are unchecked.
+        for (const char* name : {"_LogFo_Search", "_LogFo_LogSearch"})
+            action(QString::fromLatin1(name))->setChecked(false);
+        break;
+    default: break; // WMEXPORTGAUGE, WMOPENCONTACTPERLOG, voice box: no effect
     }
     updateActions();
 }

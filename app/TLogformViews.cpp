@@ -11,6 +11,7 @@
 #include "ui/navbar/AdvNavBar.h"
 #include "ui/statusbar/PanelStatusBar.h"
 
+#include <QAction>
 #include <QCheckBox>
 #include <QLayout>
 #include <QRadioButton>
@@ -144,6 +145,10 @@ void TLogform::AdvNavBar1Change()
             syncLogButtons();
             break;
         }
+        // The search entry of the list shown.
+        const bool contacts = m_navBar->activeTabIndex() == TabContacts;
+        action(QStringLiteral("_LogFo_Search"))->setVisible(contacts);
+        action(QStringLiteral("_LogFo_LogSearch"))->setVisible(!contacts);
         updateActions();
     } catch (const std::exception& e) {
         reportError(QStringLiteral("# Orvanta - AdvNavBar1Change"), &e);

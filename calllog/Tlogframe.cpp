@@ -16,6 +16,7 @@
 #include "ui/grid/GridColumnMenu.h"
 #include "ui/grid/GridController.h"
 #include "ui/grid/GridLayoutPersistence.h"
+#include "ui/grid/GridSearchPanel.h"
 #include "ui/grid/GridUpdateLock.h"
 #include "ui/grid/GridView.h"
 #include "ui/grid/ListFrameScaffold.h"
@@ -24,11 +25,8 @@
 
 #include <QAction>
 #include <QApplication>
-#include <QCheckBox>
-#include <QComboBox>
 #include <QHBoxLayout>
 #include <QLabel>
-#include <QLineEdit>
 #include <QMenu>
 #include <QPainter>
 #include <QPushButton>
@@ -155,47 +153,14 @@ void Tlogframe::buildLayout()
     m_fp3 = m_scaffold->panel();
     m_cl1 = m_scaffold->caption();
 
-    // The search panel: built complete, kept collapsed and disabled.
-    m_searchPanel = new QFrame(m_fp3);
-    m_searchPanel->setObjectName(QStringLiteral("RzPanel1"));
-    auto* sp = new QHBoxLayout(m_searchPanel);
-    sp->setContentsMargins(4, 2, 4, 2);
-    // Collapsed, the panel must not dictate the frame's width: the log list has to fit narrow windows.
-    sp->setSizeConstraint(QLayout::SetNoConstraint);
-    m_searchPanel->setSizePolicy(QSizePolicy::Ignored, QSizePolicy::Fixed);
-    auto* l1 = new QLabel(QStringLiteral("Suchen nach:"), m_searchPanel);
-    m_cxTE1 = new QLineEdit(m_searchPanel);
-    m_cxTE1->setObjectName(QStringLiteral("cxTE1"));
-    auto* l2 = new QLabel(QStringLiteral("Suchen in:"), m_searchPanel);
-    m_searchColumns = new QComboBox(m_searchPanel);
-    m_searchColumns->setObjectName(QStringLiteral("cxCheckComboBox1"));
-    m_searchColumns->addItems({QStringLiteral("Datum"), QStringLiteral("Zeit"), QStringLiteral("Anrufer"),
-                               QStringLiteral("An"), QStringLiteral("Status"), QStringLiteral("Bemerkung"),
-                               QStringLiteral("Region")});
-    const char* checkNames[3] = {"RzChB1", "RzChB2", "RzChB3"};
-    const QString checkTexts[3] = {QStringLiteral("aktuellen Filter auf Suchergebnis anwenden"),
-                                   QStringLiteral("genaue Suche"),
-                                   QStringLiteral("Groß-/Kleinschreibung berücksichtigen")};
-    m_l3 = new QLabel(QStringLiteral("» Suchmaske löschen «"), m_searchPanel);
-    m_l3->setObjectName(QStringLiteral("L3"));
-    m_searchStart = new QPushButton(QStringLiteral("Jetzt suchen"), m_searchPanel);
-    m_searchStart->setObjectName(QStringLiteral("ADVSearchStart"));
-    m_searchClose = new QPushButton(QStringLiteral("X"), m_searchPanel);
-    m_searchClose->setObjectName(QStringLiteral("AdvCloseSearchPan"));
-    m_searchClose->setToolTip(QStringLiteral("Suche schließen"));
-    sp->addWidget(l1);
-    sp->addWidget(m_cxTE1);
-    sp->addWidget(l2);
-    sp->addWidget(m_searchColumns);
-    for (int i = 0; i < 3; ++i) {
-        m_rzChB[i] = new QCheckBox(checkTexts[i], m_searchPanel);
-        m_rzChB[i]->setObjectName(QLatin1String(checkNames[i]));
-        sp->addWidget(m_rzChB[i]);
-    }
-    sp->addWidget(m_l3);
-    sp->addWidget(m_searchStart);
-    sp->addWidget(m_searchClose);
-    connect(m_searchClose, &QPushButton::clicked, this, [this] { postMessage(m_host, WMSEARCHUNCHECKED, 0, 0); });
+    // The search panel: collapsed and disabled until the user opens it.
+    m_searchPanel = new GridSearchPanel({QStringLiteral("Datum"), QStringLiteral("Zeit"), QStringLiteral("Anrufer"),
+                                         QStringLiteral("An"), QStringLiteral("Status"), QStringLiteral("Bemerkung"),
+                                         QStringLiteral("Region")},
+                                        m_fp3);
+    connect(m_searchPanel, &GridSearchPanel::searchRequested, this, &Tlogframe::ADVSearchStartClick);
+    connect(m_searchPanel, &GridSearchPanel::clearRequested, this, &Tlogframe::L3Click);
+    connect(m_searchPanel, &GridSearchPanel::closeRequested, this, &Tlogframe::AdvCloseSearchPanClick);
     m_scaffold->addPanel(m_searchPanel);
 
     m_view = m_scaffold->addTableView(QStringLiteral("cxGrid1DBTableView1"));
@@ -358,6 +323,10 @@ void Tlogframe::buildActions()
                                   QStyle::SP_MediaPlay);
     connect(m_lfBemerkung, &QAction::triggered, this, [this] { postMessage(m_host, WMLOGOPENBEMERKUNG, 0, 0); });
     connect(m_lfDelitem, &QAction::triggered, this, [this] { postMessage(m_host, WMDELETELOGITEM, 0, 0); });
+    m_lfSearch = action("lf_search", QStringLiteral("Suchen..."), QStyle::SP_FileDialogContentsView);
+    m_lfSearch->setShortcut(QKeySequence::Find);
+    m_lfSearch->setShortcutContext(Qt::WidgetWithChildrenShortcut);
+    connect(m_lfSearch, &QAction::triggered, this, &Tlogframe::OpenSearchPanel);
 
     m_popup = new QMenu(this);
     m_popup->setObjectName(QStringLiteral("AdvPopupMenu1"));
@@ -369,6 +338,8 @@ void Tlogframe::buildActions()
     m_popup->addAction(m_lfOpenContactFromLog);
     m_popup->addSeparator();
     m_popup->addAction(m_lfDelitem);
+    m_popup->addSeparator();
+    m_popup->addAction(m_lfSearch);
     m_popup->addSeparator();
     m_columnMenu = new GridColumnMenu(m_view, m_popup, QStringLiteral("Ansicht1"), this);
     m_columnMenu->setClickHandler([this](QAction* entry) { Datum1Click(entry); });
@@ -670,6 +641,13 @@ void Tlogframe::SetNewFilter(int kind)
                     {GridFilterItem::condition(columnName("TSDATE"), op, {}, QString::fromUtf8(texts[kind - 1]))}));
                 g->setTag(kind);
                 g->setFilterActive(true);
+                // The period chosen last counts: a search that replaced the filter now narrows it.
+                if (g->isSearching() && !g->search().narrow) {
+                    GridSearch search = g->search();
+                    search.narrow = true;
+                    g->setSearch(search);
+                    m_searchPanel->setNarrowsFilter(true);
+                }
             }
         } else if (kind != 0 || !m_filterName.isEmpty() || g->tag() != 0) {
             ViewLock lock(m_view);
@@ -769,6 +747,15 @@ void Tlogframe::UpdateLogCaption()
         else
             text = QStringLiteral("Anrufprotokoll (Filter unbekannt)");
     }
+    if (!m_searchedText.isEmpty() && !(m_viewMode == 1 && m_noLog)) {
+        const QString searched = QStringLiteral("Suche: \"") + m_searchedText + QLatin1Char('"');
+        if (m_viewMode == 1)
+            text += QStringLiteral(" (") + searched + QLatin1Char(')');
+        else if (m_viewMode == 0 && !m_filterName.isEmpty() && controller()->search().narrow)
+            text.insert(text.size() - 1, QStringLiteral(", ") + searched);
+        else if (m_viewMode == 0)
+            text = QStringLiteral("Anrufprotokoll (") + searched + QLatin1Char(')');
+    }
     m_cl1->setText(text);
 }
 
@@ -836,17 +823,95 @@ int Tlogframe::CurrentLogLID() const
 
 void Tlogframe::ResetSearchPanel()
 {
-    m_searchPanel->setFixedHeight(1);
-    m_searchColumns->setCurrentIndex(-1);
-    m_searchColumns->setEnabled(false);
-    for (QCheckBox* box : m_rzChB) {
-        box->setChecked(false);
-        box->setEnabled(false);
+    m_searchPanel->reset();
+    m_searchedText.clear();
+    controller()->clearSearch();
+}
+
+bool Tlogframe::isSearchShown() const
+{
+    return m_searchPanel->isOpen();
+}
+
+void Tlogframe::OpenSearchPanel()
+{
+    if (!controller()->isActive())
+        return;
+    m_searchPanel->open();
+}
+
+void Tlogframe::ADVSearchStartClick()
+{
+    BusyCursor busy;
+    try {
+        GridSearch search;
+        search.text = m_searchPanel->searchText();
+        for (const QString& caption : m_searchPanel->chosenColumns()) {
+            const int c = controller()->columnByCaption(caption);
+            if (c >= 0)
+                search.columns.push_back(c);
+        }
+        search.exact = m_searchPanel->exact();
+        search.caseSensitive = m_searchPanel->caseSensitive();
+        search.narrow = m_searchPanel->narrowsFilter();
+        ViewLock lock(m_view);
+        controller()->setSearch(search);
+        m_searchedText = search.isActive() ? search.text : QString();
+    } catch (const std::exception& e) {
+        BusyCursor::resetCursor();
+        reportError(kLabel + QStringLiteral("ADVSearchStartClick"), &e);
     }
-    m_l3->hide();
-    m_cxTE1->clear();
-    m_cxTE1->setEnabled(false);
-    m_searchStart->setEnabled(false);
+    BusyCursor::resetCursor();
+    UpdateLogCaption();
+    PostLogStatus();
+    lf_bemerkungUpdate();
+}
+
+void Tlogframe::L3Click()
+{
+    removeSearch();
+}
+
+void Tlogframe::AdvCloseSearchPanClick()
+{
+    removeSearch();
+    m_searchPanel->reset();
+    postMessage(m_host, WMSEARCHUNCHECKED, 0, 0);
+    if (m_view->isVisible())
+        m_view->setFocus();
+}
+
+void Tlogframe::removeSearch()
+{
+    if (controller()->search() != GridSearch()) {
+        ViewLock lock(m_view);
+        controller()->clearSearch();
+    }
+    const bool changed = !m_searchedText.isEmpty();
+    m_searchedText.clear();
+    if (changed) {
+        UpdateLogCaption();
+        PostLogStatus();
+        lf_bemerkungUpdate();
+    }
+}
+
+bool Tlogframe::isActionEnabled(const QString& actionName) const
+{
+    if (actionName == QLatin1String("_LogFo_LogSearch"))
+        return controller()->isActive();
+    return false;
+}
+
+void Tlogframe::executeAction(const QString& actionName)
+{
+    if (actionName != QLatin1String("_LogFo_LogSearch"))
+        return;
+    // The main window's entry shows the panel and hides it again.
+    if (m_searchPanel->isOpen())
+        AdvCloseSearchPanClick();
+    else
+        OpenSearchPanel();
 }
 
 void Tlogframe::ApplyColorScheme()

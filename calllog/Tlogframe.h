@@ -12,11 +12,8 @@
 #include <memory>
 
 class QAction;
-class QCheckBox;
-class QComboBox;
 class QFrame;
 class QLabel;
-class QLineEdit;
 class QMenu;
 class QPushButton;
 
@@ -26,6 +23,7 @@ class GridColumnMenu;
 class GridController;
 struct GridCellInfo;
 class GridLayoutPersistence;
+class GridSearchPanel;
 struct LogFieldIndexes;
 class GridView;
 class ListFrameScaffold;
@@ -75,7 +73,20 @@ public:
     void ClearFilterItems();
     void UpdateLogCaption();
     void PostLogStatus();
+    // The search panel: collapsed, emptied, no search.
     void ResetSearchPanel();
+    // Ctrl+F, "Suchen..." and the main window's entry: expanded, enabled, focus in "Suchen nach:".
+    void OpenSearchPanel();
+    // "Jetzt suchen" (or Enter) with a text and a column: the grid shows what the search finds.
+    void ADVSearchStartClick();
+    // "» Suchmaske löschen «": the mask is emptied, the search removed.
+    void L3Click();
+    // "X": the search removed, the panel collapsed, the host told by WMSEARCHUNCHECKED.
+    void AdvCloseSearchPanClick();
+    [[nodiscard]] bool isSearchShown() const override;
+    [[nodiscard]] GridSearchPanel* searchPanel() const { return m_searchPanel; }
+    [[nodiscard]] bool isActionEnabled(const QString& actionName) const override;
+    void executeAction(const QString& actionName) override;
     void ApplyColorScheme();
     void SetTableColVisibleState(bool visible, int tag);
 
@@ -102,6 +113,7 @@ private:
     void showPopup(const QPoint& globalPos);
     [[nodiscard]] bool paintAbidCell(QPainter& painter, const GridCellInfo& cell) const;
     void clearFocusedRecord();
+    void removeSearch();
     [[nodiscard]] bool connected() const;
 
     TDM2* m_dm;
@@ -121,13 +133,8 @@ private:
     std::unique_ptr<GridLayoutPersistence> m_layouts;
     QFrame* m_fp3 = nullptr;
     TVKCutLabel* m_cl1 = nullptr;
-    QFrame* m_searchPanel = nullptr; // RzPanel1
-    QLineEdit* m_cxTE1 = nullptr;
-    QComboBox* m_searchColumns = nullptr; // cxCheckComboBox1
-    QCheckBox* m_rzChB[3] = {};
-    QLabel* m_l3 = nullptr;
-    QPushButton* m_searchStart = nullptr;
-    QPushButton* m_searchClose = nullptr;
+    GridSearchPanel* m_searchPanel = nullptr; // RzPanel1
+    QString m_searchedText; // the text of the search the grid shows, empty for none
     GridView* m_view = nullptr;
 
     QAction* m_lfBemerkung = nullptr;
@@ -135,6 +142,7 @@ private:
     QAction* m_lfAttachToContact = nullptr;
     QAction* m_lfOpenContactFromLog = nullptr;
     QAction* m_lfPlayVoiceboxItem = nullptr;
+    QAction* m_lfSearch = nullptr;
     QMenu* m_popup = nullptr;  // AdvPopupMenu1
     GridColumnMenu* m_columnMenu = nullptr;
 };

@@ -17,6 +17,7 @@
 #include "ui/grid/GridColumnMenu.h"
 #include "ui/grid/GridController.h"
 #include "ui/grid/GridLayoutPersistence.h"
+#include "ui/grid/GridSearchPanel.h"
 #include "ui/grid/GridUpdateLock.h"
 #include "ui/grid/GridView.h"
 #include "ui/grid/ListFrameScaffold.h"
@@ -241,6 +242,17 @@ void Tcontactlistframe::buildLayout()
     m_scaffold = std::make_unique<ListFrameScaffold>(this);
     m_cl1 = m_scaffold->caption();
     m_cl1->setText(QStringLiteral("Kontakte (alle)"));
+    // Before the grid host moves into the splitter: strips stand above the grid host.
+    m_searchPanel = new GridSearchPanel(
+        {QStringLiteral("Anrede"), QStringLiteral("Anschriftenzusatz"), QStringLiteral("Bundesland"),
+         QStringLiteral("Firma"), QStringLiteral("Kategorie"), QStringLiteral("Kontakt"), QStringLiteral("Land"),
+         QStringLiteral("Name"), QStringLiteral("Ort"), QStringLiteral("PLZ"), QStringLiteral("Straße"),
+         QStringLiteral("Titel"), QStringLiteral("Vorname")},
+        m_scaffold->panel());
+    m_scaffold->addPanel(m_searchPanel);
+    connect(m_searchPanel, &GridSearchPanel::searchRequested, this, &Tcontactlistframe::ADVSearchStartClick);
+    connect(m_searchPanel, &GridSearchPanel::clearRequested, this, &Tcontactlistframe::L3Click);
+    connect(m_searchPanel, &GridSearchPanel::closeRequested, this, &Tcontactlistframe::AdvCloseSearchPanClick);
     m_view = m_scaffold->addTableView(QStringLiteral("cxGrid1DBTableView1"));
     m_view->setHeaderHeight(21);
     m_view->setAutoWidth(true);
@@ -422,6 +434,11 @@ void Tcontactlistframe::buildActions()
     connect(m_newCont, &QAction::triggered, this, [this] { postMessage(m_host, WMNEWCONTACT, 0, 0); });
     connect(m_editCont, &QAction::triggered, this, [this] { postMessage(m_host, WMOPENCONTACT, 0, 0); });
     connect(m_deleteCont, &QAction::triggered, this, [this] { postMessage(m_host, WMDELETECONTACT, 0, 0); });
+    m_search = action("cv_search", QStringLiteral("Suchen..."), QStringLiteral("Kontakte durchsuchen"),
+                      QStyle::SP_FileDialogContentsView);
+    m_search->setShortcut(QKeySequence::Find);
+    m_search->setShortcutContext(Qt::WidgetWithChildrenShortcut);
+    connect(m_search, &QAction::triggered, this, &Tcontactlistframe::OpenSearchPanel);
 
     m_popup = new QMenu(this);
     m_popup->setObjectName(QStringLiteral("AdvPopupMenu2"));
@@ -429,6 +446,8 @@ void Tcontactlistframe::buildActions()
     m_popup->addAction(m_editCont);
     m_popup->addSeparator();
     m_popup->addAction(m_deleteCont);
+    m_popup->addSeparator();
+    m_popup->addAction(m_search);
     m_popup->addSeparator();
     m_columnMenu = new GridColumnMenu(m_view, m_popup, QStringLiteral("Ansicht1"), this);
     static constexpr const char* captions[13] = {"Kontakt", "Straße", "PLZ", "Ort", "Kategorie", "Anrede", "Name",
@@ -448,6 +467,8 @@ void Tcontactlistframe::buildActions()
     m_cardPopup->addAction(m_editCont);
     m_cardPopup->addSeparator();
     m_cardPopup->addAction(m_deleteCont);
+    m_cardPopup->addSeparator();
+    m_cardPopup->addAction(m_search);
     m_cardPopup->addSeparator();
     m_rowMenu = new GridColumnMenu(m_cards, m_cardPopup, QStringLiteral("Ansicht2"), this);
     static constexpr const char* rowCaptions[10] = {"Anrede",   "Titel",  "Name/Vorname",      "Firma", "Kategorie",
@@ -520,6 +541,19 @@ void Tcontactlistframe::restoreLayout(int viewKind)
     }
 }
 
+GridSearch Tcontactlistframe::searchForView(const GridSearch& search, const GridController& from,
+                                            const GridController& to)
+{
+    GridSearch out = search;
+    out.columns.clear();
+    for (const int c : search.columns) {
+        const int target = c >= 0 && c < from.columnCount() ? to.columnByField(from.column(c).fieldName) : -1;
+        if (target >= 0)
+            out.columns.push_back(target);
+    }
+    return out;
+}
+
 GridFilter Tcontactlistframe::filterForView(const GridFilter& filter, const GridController& from,
                                             const GridController& to)
 {
@@ -576,6 +610,7 @@ bool Tcontactlistframe::DBConnect(QObject* mainWindow)
         ApplyColorScheme();
         m_deferSummary = false;
         m_host = mainWindow;
+        InitSearchPanel();
         m_currentLetter.clear();
         m_filterColumn = QStringLiteral("Kontakt");
         m_selectedContBez.clear();
@@ -589,6 +624,7 @@ bool Tcontactlistframe::DBConnect(QObject* mainWindow)
             openView(m_viewKind, m_viewKind == CardView ? dmsql::kSelectContactCards : dmsql::kSelectContactList);
         }
         SyncFilterState();
+        m_searchPanel->setNarrowsFilter(!m_currentLetter.isEmpty());
         setViewPopup();
         m_connected = true;
         setEnabled(true);
@@ -714,6 +750,9 @@ bool Tcontactlistframe::ChangeView(int kind)
         GridController* to = newView->controller();
         // The letter filter follows the user into the other view.
         const GridFilter filter = filterForView(from->filter(), *from, *to);
+        // So does the search.
+        const GridSearch search = searchForView(from->search(), *from, *to);
+        from->clearSearch();
         const int tag = from->tag();
         DataSet* old = dataSetOf(m_viewKind);
         if (old && old->isActive() && from->source() && !storeLayout(m_viewKind))
@@ -732,6 +771,7 @@ bool Tcontactlistframe::ChangeView(int kind)
         to->setFilter(filter);
         to->setFilterActive(filter.active);
         to->setTag(tag);
+        to->setSearch(search);
         // So does the focused contact, when the other view shows it.
         if (focusedLid > 0 && to->isActive()) {
             const int record = to->locate(focusedLid);
@@ -764,6 +804,8 @@ void Tcontactlistframe::DisableFrame()
             a->setEnabled(false);
     for (QAbstractButton* b : m_letters->buttons())
         b->setEnabled(false);
+    m_searchPanel->reset();
+    m_search->setEnabled(false);
 }
 
 // ---------------------------------------------------------------------------------------------
@@ -823,6 +865,13 @@ void Tcontactlistframe::SetNewFilter(int t)
                 g->setTag(t);
                 m_currentLetter = letter;
                 g->setFilterActive(true);
+                // The letter chosen last counts: a search that replaced the filter now narrows it.
+                if (g->isSearching() && !g->search().narrow) {
+                    GridSearch search = g->search();
+                    search.narrow = true;
+                    g->setSearch(search);
+                    m_searchPanel->setNarrowsFilter(true);
+                }
             }
         } else if (t == 0 && (!m_currentLetter.isEmpty() || g->tag() != 0)) {
             ViewLock lock(activeGrid());
@@ -844,11 +893,99 @@ void Tcontactlistframe::SetNewFilter(int t)
 
 void Tcontactlistframe::SetFilterCaption()
 {
-    if (m_currentLetter.isEmpty())
-        m_cl1->setText(QStringLiteral("Kontakte (alle)"));
-    else
-        m_cl1->setText(QStringLiteral("Kontakte (") + m_filterColumn + QStringLiteral(" gefiltert nach \"") +
-                       m_currentLetter + QStringLiteral("\")"));
+    const QString searched =
+        m_searchedText.isEmpty() ? QString() : QStringLiteral("Suche: \"") + m_searchedText + QLatin1Char('"');
+    const bool filtered = !m_currentLetter.isEmpty() && (searched.isEmpty() || controller()->search().narrow);
+    QString text = QStringLiteral("Kontakte (");
+    if (filtered)
+        text += m_filterColumn + QStringLiteral(" gefiltert nach \"") + m_currentLetter + QLatin1Char('"');
+    if (!searched.isEmpty())
+        text += (filtered ? QStringLiteral(", ") : QString()) + searched;
+    if (!filtered && searched.isEmpty())
+        text += QStringLiteral("alle");
+    m_cl1->setText(text + QLatin1Char(')'));
+}
+
+// ---------------------------------------------------------------------------------------------
+// Search
+
+void Tcontactlistframe::InitSearchPanel()
+{
+    m_searchPanel->reset();
+    m_searchedText.clear();
+    m_view->controller()->clearSearch();
+    m_cards->controller()->clearSearch();
+    m_search->setEnabled(true);
+}
+
+bool Tcontactlistframe::isSearchShown() const
+{
+    return m_searchPanel->isOpen();
+}
+
+void Tcontactlistframe::OpenSearchPanel()
+{
+    if (!isConnected() || !controller()->isActive())
+        return;
+    m_searchPanel->open();
+}
+
+void Tcontactlistframe::ADVSearchStartClick()
+{
+    BusyCursor busy;
+    try {
+        GridController* g = controller();
+        const GridController* table = m_view->controller();
+        GridSearch search;
+        search.text = m_searchPanel->searchText();
+        // The captions are the table's; both views find their columns by the field.
+        for (const QString& caption : m_searchPanel->chosenColumns()) {
+            const int t = table->columnByCaption(caption);
+            const int c = t >= 0 ? g->columnByField(table->column(t).fieldName) : -1;
+            if (c >= 0)
+                search.columns.push_back(c);
+        }
+        search.exact = m_searchPanel->exact();
+        search.caseSensitive = m_searchPanel->caseSensitive();
+        search.narrow = m_searchPanel->narrowsFilter();
+        ViewLock lock(activeGrid());
+        g->setSearch(search);
+        m_searchedText = search.isActive() ? search.text : QString();
+    } catch (const std::exception& e) {
+        BusyCursor::resetCursor();
+        reportError(kLabel + QStringLiteral("ADVSearchStartClick"), &e);
+    }
+    BusyCursor::resetCursor();
+    SetFilterCaption();
+    updateFooter();
+}
+
+void Tcontactlistframe::L3Click()
+{
+    removeSearch();
+}
+
+void Tcontactlistframe::AdvCloseSearchPanClick()
+{
+    removeSearch();
+    m_searchPanel->reset();
+    postMessage(m_host, WMSEARCHUNCHECKED, 0, 0);
+    GridViewBase* grid = activeGrid();
+    if (grid->isEnabled() && grid->isVisible())
+        grid->setFocus();
+}
+
+void Tcontactlistframe::removeSearch()
+{
+    if (controller()->search() != GridSearch()) {
+        ViewLock lock(activeGrid());
+        controller()->clearSearch();
+    }
+    if (m_searchedText.isEmpty())
+        return;
+    m_searchedText.clear();
+    SetFilterCaption();
+    updateFooter();
 }
 
 QString Tcontactlistframe::captionText() const
@@ -1147,11 +1284,21 @@ bool Tcontactlistframe::isActionEnabled(const QString& actionName) const
         return connected;
     if (actionName == m_editCont->objectName() || actionName == m_deleteCont->objectName())
         return connected && m_dm->SelectedLID != -1;
+    if (actionName == QLatin1String("_LogFo_Search"))
+        return connected && controller()->isActive();
     return false;
 }
 
 void Tcontactlistframe::executeAction(const QString& actionName)
 {
+    if (actionName == QLatin1String("_LogFo_Search")) {
+        // The main window's entry shows the panel and hides it again.
+        if (m_searchPanel->isOpen())
+            AdvCloseSearchPanClick();
+        else
+            OpenSearchPanel();
+        return;
+    }
     cv_editcontUpdate();
     for (QAction* a : {m_newCont, m_editCont, m_deleteCont})
         if (a->objectName() == actionName && a->isEnabled())

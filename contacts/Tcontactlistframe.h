@@ -34,6 +34,7 @@ class GridColumnMenu;
 class GridController;
 struct GridFilter;
 class GridLayoutPersistence;
+class GridSearchPanel;
 class GridView;
 class GridViewBase;
 class ListFrameScaffold;
@@ -83,6 +84,20 @@ public:
     [[nodiscard]] QString captionText() const;
     // The tag of the pressed letter button.
     [[nodiscard]] int pressedLetter() const;
+
+    // --- search -----------------------------------------------------------------------------
+    // Collapsed, emptied, no search in either view (DBConnect).
+    void InitSearchPanel();
+    // Ctrl+F, "Suchen..." and the main window's entry: expanded, enabled, focus in "Suchen nach:".
+    void OpenSearchPanel();
+    // "Jetzt suchen" (or Enter) with a text and a column: the active view shows what it finds.
+    void ADVSearchStartClick();
+    // "» Suchmaske löschen «": the mask is emptied, the search removed.
+    void L3Click();
+    // "X": the search removed, the panel collapsed, the host told by WMSEARCHUNCHECKED.
+    void AdvCloseSearchPanClick();
+    [[nodiscard]] bool isSearchShown() const override;
+    [[nodiscard]] GridSearchPanel* searchPanel() const { return m_searchPanel; }
 
     // --- summary ----------------------------------------------------------------------------
     // One tick of the summary delay timer (T1, 50 ms).
@@ -139,6 +154,9 @@ private:
     [[nodiscard]] bool storeLayout(int viewKind) const;
     void restoreLayout(int viewKind);
     // The old view's filter for the new view's columns: conditions follow their field.
+    [[nodiscard]] static GridSearch searchForView(const GridSearch& search, const GridController& from,
+                                                  const GridController& to);
+    void removeSearch();
     [[nodiscard]] static GridFilter filterForView(const GridFilter& filter, const GridController& from,
                                                   const GridController& to);
     void buildLetterBar(QWidget* parent);
@@ -175,6 +193,7 @@ private:
     QString m_currentLetter;
     QString m_filterColumn = QStringLiteral("Kontakt");
     QString m_selectedContBez;
+    QString m_searchedText; // the text of the search the grid shows, empty for none
     std::function<void(int)> m_noteOpener;
 
     std::unique_ptr<ListFrameScaffold> m_scaffold;
@@ -193,6 +212,8 @@ private:
     QAction* m_newCont = nullptr;
     QAction* m_editCont = nullptr;
     QAction* m_deleteCont = nullptr;
+    QAction* m_search = nullptr;
+    GridSearchPanel* m_searchPanel = nullptr; // RzPanel1
     QMenu* m_popup = nullptr;
     GridColumnMenu* m_columnMenu = nullptr;
     QMenu* m_cardPopup = nullptr;

@@ -14,6 +14,7 @@
 
 #include <QAction>
 #include <QCheckBox>
+#include <QPushButton>
 #include <QMenuBar>
 #include <QRadioButton>
 #include <QSignalSpy>
@@ -340,6 +341,39 @@ private Q_SLOTS:
             sendMessage(&w, WMCONTACTDATAFROMSCREEN, odd, 0);
         QCOMPARE(env.dialogs().count(), shown);
         QVERIFY(w.editWindows().allFree());
+    }
+
+    void theSearchEntryFollowsTheListsPanel()
+    {
+        AppTestEnv env;
+        TLogform& w = env.window({}, defaultMainWindowFeatures());
+        w.show();
+        QVERIFY(w.logFrame());
+        QVERIFY(act(w, "_LogFo_LogSearch")->isVisible());
+        QVERIFY(!act(w, "_LogFo_Search")->isVisible());
+        w.updateActions();
+        trigger(w, "_LogFo_LogSearch");
+        QVERIFY(w.logFrame()->isSearchShown());
+        w.updateActions();
+        QVERIFY(act(w, "_LogFo_LogSearch")->isChecked());
+        // The list's close button: WMSEARCHUNCHECKED unchecks the entry.
+        auto* close = w.logFrame()->findChild<QPushButton*>(QStringLiteral("AdvCloseSearchPan"));
+        QTest::mouseClick(close, Qt::LeftButton);
+        QTRY_VERIFY(!act(w, "_LogFo_LogSearch")->isChecked());
+        QVERIFY(!w.logFrame()->isSearchShown());
+
+        trigger(w, "dxBB_Ansicht_Kontakte");
+        QVERIFY(act(w, "_LogFo_Search")->isVisible());
+        QVERIFY(!act(w, "_LogFo_LogSearch")->isVisible());
+        w.updateActions();
+        trigger(w, "_LogFo_Search");
+        QVERIFY(w.contactFrame()->isSearchShown());
+        w.updateActions();
+        QVERIFY(act(w, "_LogFo_Search")->isChecked());
+        trigger(w, "_LogFo_Search"); // again: closed
+        QVERIFY(!w.contactFrame()->isSearchShown());
+        QTRY_VERIFY(!act(w, "_LogFo_Search")->isChecked());
+        QCOMPARE(env.dialogs().count(), 0);
     }
 
     void statusPanelShowsCounts()

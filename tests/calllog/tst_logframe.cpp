@@ -2,10 +2,16 @@
 #include "tests/calllog/LogTestEnv.h"
 #include "tests/support/TestRegistry.h"
 #include "ui/grid/GridController.h"
+#include "ui/grid/GridSearchPanel.h"
 #include "ui/grid/GridView.h"
 #include "ui/label/TVKCutLabel.h"
 
 #include <QAction>
+#include <QApplication>
+#include <QCheckBox>
+#include <QLabel>
+#include <QLineEdit>
+#include <QPushButton>
 #include <QMenu>
 #include <QTest>
 
@@ -83,6 +89,7 @@ private Q_SLOTS:
     void focusedRowDrivesActionsAndMessages();
     void columnMenuFollowsVisibility();
     void dayModeAndRefresh();
+    void searchFindsNarrowsClearsAndCloses();
     void databaseGoneKeepsTheFrameUsable();
     void withoutADataModuleNothingIsRead();
 };
@@ -444,6 +451,172 @@ void TstLogFrame::focusedRowDrivesActionsAndMessages()
     QCOMPARE(env.host().of(WMSEARCHUNCHECKED).size(), 1);
 }
 
+namespace {
+
+// Types the text into "Suchen nach:" and presses Enter.
+void search(Tlogframe& f, const QString& text)
+{
+    auto* edit = f.findChild<QLineEdit*>(QStringLiteral("cxTE1"));
+    edit->setText(text);
+    QTest::keyClick(edit, Qt::Key_Return);
+}
+
+void check(Tlogframe& f, const char* box, bool on)
+{
+    f.findChild<QCheckBox*>(QLatin1String(box))->setChecked(on);
+}
+
+void chooseColumns(Tlogframe& f, const QStringList& captions)
+{
+    f.searchPanel()->setChosenColumns(captions);
+}
+
+} // namespace
+
+void TstLogFrame::searchFindsNarrowsClearsAndCloses()
+{
+    LogTestEnv env;
+    fillCalls(env);
+    env.addCall(7, "'2024-05-15'", "'12:00:00'", "'Müller'", "'0305555'");
+    env.addCall(8, "'2024-05-14'", "'12:00:00'", "'Muller'", "'0306666'");
+    env.addCall(9, "'2024-05-10'", "'12:00:00'", "'Bäckerei Straße'", "'0307777'");
+    env.addCall(10, "'2024-05-01'", "'12:00:00'", "'a_b'", "NULL");
+    env.addCall(11, "'2024-05-01'", "'13:00:00'", "'axb'", "NULL");
+    env.db().exec(QStringLiteral("UPDATE LOG SET BEMERK = '50% \"Rabatt\"' WHERE LID = 3"));
+    Tlogframe f(&env.dm());
+    f.resize(900, 400);
+    f.show();
+    QVERIFY(QTest::qWaitForWindowActive(&f));
+    f.Firstep(&env.host());
+    auto* panel = f.findChild<QWidget*>(QStringLiteral("RzPanel1"));
+    auto* edit = f.findChild<QLineEdit*>(QStringLiteral("cxTE1"));
+    QCOMPARE(panel->height(), 1);
+
+    // Ctrl+F in the grid opens the panel, every column chosen, the focus in "Suchen nach:".
+    f.view()->setFocus();
+    QTest::keyClick(f.view(), Qt::Key_F, Qt::ControlModifier);
+    QVERIFY(f.isSearchShown());
+    QVERIFY(panel->height() > 1);
+    QVERIFY(edit->isEnabled());
+    QTRY_COMPARE(QApplication::focusWidget(), edit);
+    QCOMPARE(f.searchPanel()->chosenColumns().size(), 7);
+    QCOMPARE(action(f, "lf_search")->text(), QStringLiteral("Suchen..."));
+    QVERIFY(f.popupMenu()->actions().contains(action(f, "lf_search")));
+
+    // Case and ß fold as the sort order does, umlauts stay apart.
+    search(f, QStringLiteral("muller"));
+    QCOMPARE(lids(f), QList<int>{8});
+    QCOMPARE(f.captionText(), QStringLiteral("Anrufprotokoll (Suche: \"muller\")"));
+    QCOMPARE(lastStatus(env), 1);
+    search(f, QStringLiteral("MÜLLER"));
+    QCOMPARE(lids(f), QList<int>{7});
+    search(f, QStringLiteral("strasse"));
+    QCOMPARE(lids(f), QList<int>{9});
+    check(f, "RzChB3", true); // "Groß-/Kleinschreibung berücksichtigen"
+    search(f, QStringLiteral("straße"));
+    QCOMPARE(lids(f), QList<int>{});
+    QCOMPARE(lastStatus(env), 0);
+    search(f, QStringLiteral("Straße"));
+    QCOMPARE(lids(f), QList<int>{9});
+    check(f, "RzChB3", false);
+    check(f, "RzChB2", true); // "genaue Suche": the whole cell
+    search(f, QStringLiteral("meier"));
+    QCOMPARE(lids(f), (QList<int>{3, 1}));
+    search(f, QStringLiteral("Meie"));
+    QCOMPARE(lids(f), QList<int>{});
+    check(f, "RzChB2", false);
+
+    // Wildcards and quotes are plain characters.
+    search(f, QStringLiteral("a_b"));
+    QCOMPARE(lids(f), QList<int>{10});
+    search(f, QStringLiteral("%"));
+    QCOMPARE(lids(f), QList<int>{3});
+    search(f, QStringLiteral("\"Rabatt\""));
+    QCOMPARE(lids(f), QList<int>{3});
+    search(f, QStringLiteral("*"));
+    QCOMPARE(lids(f), QList<int>{});
+
+    // Only the chosen columns; dates by what the cell shows.
+    chooseColumns(f, {QStringLiteral("Datum")});
+    search(f, QStringLiteral("14.05."));
+    QCOMPARE(lids(f), (QList<int>{3, 8, 2}));
+    chooseColumns(f, {QStringLiteral("Zeit")});
+    search(f, QStringLiteral("12:00:0"));
+    QCOMPARE(lids(f), (QList<int>{7, 8, 9, 10}));
+    chooseColumns(f, {QStringLiteral("Status"), QStringLiteral("An")});
+    search(f, QStringLiteral("Meier"));
+    QCOMPARE(lids(f), QList<int>{});
+    QCOMPARE(env.dialogs().count(), 0);
+
+    // A missing text or column: the warning, the grid as it was.
+    chooseColumns(f, {});
+    search(f, QStringLiteral("Meier"));
+    chooseColumns(f, {QStringLiteral("Anrufer")});
+    search(f, QString());
+    QCOMPARE(env.dialogs().texts(DialogKind::Warning),
+             QStringList(2, GridSearchPanel::missingInputWarning()));
+    QCOMPARE(lids(f), QList<int>{});
+
+    // With a period filter: the search replaces it, or narrows it with RzChB1. A period chosen
+    // while a search replaces the filter makes the search narrow it.
+    f.SetNewFilter(2);
+    QVERIFY(f.findChild<QCheckBox*>(QStringLiteral("RzChB1"))->isChecked());
+    QVERIFY(f.controller()->search().narrow);
+    check(f, "RzChB1", false);
+    search(f, QStringLiteral("Meier"));
+    QCOMPARE(lids(f), (QList<int>{3, 1}));
+    QCOMPARE(f.captionText(), QStringLiteral("Anrufprotokoll (Suche: \"Meier\")"));
+    check(f, "RzChB1", true);
+    QTest::mouseClick(f.findChild<QPushButton*>(QStringLiteral("ADVSearchStart")), Qt::LeftButton);
+    QCOMPARE(lids(f), QList<int>{3});
+    QCOMPARE(f.captionText(), QStringLiteral("Anrufprotokoll (gefiltert nach \"diese Woche\", Suche: \"Meier\")"));
+    QCOMPARE(lastStatus(env), 1);
+
+    // "» Suchmaske löschen «": the mask emptied, the filter alone again.
+    QTest::mouseClick(f.findChild<QLabel*>(QStringLiteral("L3")), Qt::LeftButton);
+    QCOMPARE(edit->text(), QString());
+    QCOMPARE(f.searchPanel()->chosenColumns().size(), 7);
+    QVERIFY(!f.controller()->isSearching());
+    QCOMPARE(lids(f), (QList<int>{7, 5, 4, 3, 8, 2}));
+    QCOMPARE(f.captionText(), QStringLiteral("Anrufprotokoll (gefiltert nach \"diese Woche\")"));
+    QCOMPARE(lastStatus(env), 6);
+
+    // A period chosen while a search replaces the filter: the search narrows the new period.
+    check(f, "RzChB1", false);
+    search(f, QStringLiteral("Meier"));
+    QCOMPARE(lids(f), (QList<int>{3, 1}));
+    f.SetNewFilter(1);
+    QVERIFY(f.findChild<QCheckBox*>(QStringLiteral("RzChB1"))->isChecked());
+    QCOMPARE(lids(f), QList<int>{});
+    QCOMPARE(f.captionText(), QStringLiteral("Anrufprotokoll (gefiltert nach \"Heute\", Suche: \"Meier\")"));
+
+    // Closing removes the search and tells the host.
+    env.host().clear();
+    QTest::mouseClick(f.findChild<QPushButton*>(QStringLiteral("AdvCloseSearchPan")), Qt::LeftButton);
+    QVERIFY(!f.isSearchShown());
+    QCOMPARE(panel->height(), 1);
+    QVERIFY(!edit->isEnabled());
+    QCOMPARE(lids(f), (QList<int>{7, 5, 4}));
+    QCOMPARE(f.captionText(), QStringLiteral("Anrufprotokoll (gefiltert nach \"Heute\")"));
+    QCOMPARE(lastStatus(env), 3);
+    QCOMPARE(env.host().of(WMSEARCHUNCHECKED).size(), 1);
+
+    // The main window's entry opens and closes the panel; a day shows its own caption.
+    QVERIFY(f.isActionEnabled(QStringLiteral("_LogFo_LogSearch")));
+    f.executeAction(QStringLiteral("_LogFo_LogSearch"));
+    QVERIFY(f.isSearchShown());
+    QVERIFY(f.OpenDBonDay(QDate(2024, 5, 14)));
+    f.setViewMode(1);
+    f.SetNewFilter(0);
+    search(f, QStringLiteral("Schulz"));
+    QCOMPARE(lids(f), QList<int>{2});
+    QCOMPARE(f.captionText(), QStringLiteral("Anrufprotokoll vom 14.05.2024 (Suche: \"Schulz\")"));
+    f.executeAction(QStringLiteral("_LogFo_LogSearch"));
+    QVERIFY(!f.isSearchShown());
+    QCOMPARE(lids(f), (QList<int>{3, 8, 2}));
+    QCOMPARE(env.dialogs().count(), 2);
+}
+
 void TstLogFrame::columnMenuFollowsVisibility()
 {
     LogTestEnv env;
@@ -472,7 +645,7 @@ void TstLogFrame::columnMenuFollowsVisibility()
     for (QAction* a : f.popupMenu()->actions())
         names << (a->isSeparator() ? QStringLiteral("-") : a->menu() ? a->menu()->title() : a->objectName());
     QCOMPARE(names, (QStringList{"lf_bemerkung", "-", "lf_playvoiceboxitem", "-", "lf_attachtocontact",
-                                 "lf_opencontactfromlog", "-", "lf_delitem", "-", "Ansicht"}));
+                                 "lf_opencontactfromlog", "-", "lf_delitem", "-", "lf_search", "-", "Ansicht"}));
 
     // CL1 shortens what does not fit, keeping its text.
     auto* cl1 = f.findChild<TVKCutLabel*>(QStringLiteral("CL1"));

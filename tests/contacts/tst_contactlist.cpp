@@ -4,10 +4,18 @@
 #include "db/TDM2.h"
 #include "platform/IniFile.h"
 #include "platform/WindowMessages.h"
+#include "ui/grid/GridCardView.h"
 #include "ui/grid/GridController.h"
+#include "ui/grid/GridSearchPanel.h"
 #include "ui/grid/GridView.h"
 
 #include <QAction>
+#include <QApplication>
+#include <QCheckBox>
+#include <QLabel>
+#include <QLineEdit>
+#include <QMenu>
+#include <QPushButton>
 #include <QSplitter>
 #include <QTest>
 #include <QToolButton>
@@ -54,12 +62,160 @@ int rowOfLid(const Tcontactlistframe& f, int lid)
     return record < 0 ? -1 : g->rowOfRecord(static_cast<quint32>(record));
 }
 
+void search(Tcontactlistframe& f, const QString& text)
+{
+    auto* edit = f.findChild<QLineEdit*>(QStringLiteral("cxTE1"));
+    edit->setText(text);
+    QTest::keyClick(edit, Qt::Key_Return);
+}
+
+void check(Tcontactlistframe& f, const char* box, bool on)
+{
+    f.findChild<QCheckBox*>(QLatin1String(box))->setChecked(on);
+}
+
+void fillSearch(ContactTestEnv& env)
+{
+    const auto add = [&env](int lid, const char* contbez, const char* name, const char* str, const char* ort) {
+        ContactTestEnv::Contact c;
+        c.lid = lid;
+        c.contbez = QString::fromUtf8(contbez);
+        c.name = QString::fromUtf8(name);
+        c.str = QString::fromUtf8(str);
+        c.ort = QString::fromUtf8(ort);
+        env.addContact(c);
+    };
+    add(1, "Müller, Hans", "Müller", "Hauptstraße 1", "Berlin");
+    add(2, "Muller, Eva", "Muller", "Gartenweg 2", "Bremen");
+    add(3, "Meier AG", "", "Lindenstrasse 5", "München");
+    add(4, "Bauer", "Bauer", "", "Berlin");
+    add(5, "100% Bio_Laden", "", "", "Köln");
+    add(6, "Meiser", "Meiser", "", "Hamburg");
+}
+
 } // namespace
 
 class TstContactList : public QObject {
     Q_OBJECT
 
 private Q_SLOTS:
+    void searchInBothViewsNarrowsClearsAndCloses()
+    {
+        ContactTestEnv env;
+        fillSearch(env);
+        {
+            Tcontactlistframe f(&env.dm());
+            f.resize(900, 500);
+            f.show();
+            QVERIFY(QTest::qWaitForWindowActive(&f));
+            QVERIFY(f.DBConnect(&env.host()));
+            auto* panel = f.findChild<QWidget*>(QStringLiteral("RzPanel1"));
+            auto* edit = f.findChild<QLineEdit*>(QStringLiteral("cxTE1"));
+            QCOMPARE(panel->height(), 1);
+            QVERIFY(!edit->isEnabled());
+            QVERIFY(!f.findChild<QCheckBox*>(QStringLiteral("RzChB1"))->isChecked());
+
+            // "Suchen..." in the context menu opens the panel with the focus in "Suchen nach:".
+            QAction* entry = f.findChild<QAction*>(QStringLiteral("cv_search"));
+            QCOMPARE(entry->text(), QStringLiteral("Suchen..."));
+            QCOMPARE(entry->shortcut(), QKeySequence(QKeySequence::Find));
+            QVERIFY(f.popupMenu()->actions().contains(entry));
+            entry->trigger();
+            QVERIFY(f.isSearchShown());
+            QVERIFY(panel->height() > 1);
+            QTRY_COMPARE(QApplication::focusWidget(), edit);
+            QCOMPARE(f.searchPanel()->chosenColumns().size(), 13);
+
+            search(f, QStringLiteral("muller"));
+            QCOMPARE(names(f), QStringList{"Muller, Eva"});
+            QCOMPARE(f.captionText(), QStringLiteral("Kontakte (Suche: \"muller\")"));
+            QCOMPARE(f.footerText(), QStringLiteral(" Kontakte: 1"));
+            QCOMPARE(env.dm().SelectedLID, 2);
+            search(f, QStringLiteral("MÜLLER"));
+            QCOMPARE(names(f), QStringList{"Müller, Hans"});
+            search(f, QStringLiteral("strasse"));
+            QCOMPARE(names(f), (QStringList{"Meier AG", "Müller, Hans"}));
+            check(f, "RzChB3", true);
+            search(f, QStringLiteral("strasse"));
+            QCOMPARE(names(f), QStringList{"Meier AG"});
+            check(f, "RzChB3", false);
+            check(f, "RzChB2", true);
+            search(f, QStringLiteral("meier ag"));
+            QCOMPARE(names(f), QStringList{"Meier AG"});
+            search(f, QStringLiteral("meier"));
+            QCOMPARE(names(f), QStringList{});
+            QCOMPARE(env.dm().SelectedLID, -1);
+            check(f, "RzChB2", false);
+            search(f, QStringLiteral("%"));
+            QCOMPARE(names(f), QStringList{"100% Bio_Laden"});
+            search(f, QStringLiteral("o_L"));
+            QCOMPARE(names(f), QStringList{"100% Bio_Laden"});
+            search(f, QStringLiteral("Bio%"));
+            QCOMPARE(names(f), QStringList{});
+
+            // A letter filter: replaced by the search, or narrowed by it.
+            // A letter chosen while a search replaces the filter: the search now narrows it.
+            clickLetter(f, 13);
+            QVERIFY(f.findChild<QCheckBox*>(QStringLiteral("RzChB1"))->isChecked());
+            check(f, "RzChB1", false);
+            f.searchPanel()->setChosenColumns({QStringLiteral("Ort")});
+            search(f, QStringLiteral("berlin"));
+            QCOMPARE(names(f), (QStringList{"Bauer", "Müller, Hans"}));
+            QCOMPARE(f.captionText(), QStringLiteral("Kontakte (Suche: \"berlin\")"));
+            check(f, "RzChB1", true);
+            QTest::mouseClick(f.findChild<QPushButton*>(QStringLiteral("ADVSearchStart")), Qt::LeftButton);
+            QCOMPARE(names(f), QStringList{"Müller, Hans"});
+            QCOMPARE(f.captionText(), QStringLiteral("Kontakte (Kontakt gefiltert nach \"M\", Suche: \"berlin\")"));
+
+            // The search follows into the cards and back.
+            QVERIFY(f.ChangeView(2));
+            QCOMPARE(names(f), QStringList{"Müller, Hans"});
+            QCOMPARE(f.captionText(), QStringLiteral("Kontakte (Kontakt gefiltert nach \"M\", Suche: \"berlin\")"));
+            QVERIFY(f.cardView()->controller()->isSearching());
+            QVERIFY(f.popupMenu()->actions().contains(entry));
+            QVERIFY(f.ChangeView(1));
+            QCOMPARE(names(f), QStringList{"Müller, Hans"});
+
+            // "» Suchmaske löschen «": the letter alone again.
+            QTest::mouseClick(f.findChild<QLabel*>(QStringLiteral("L3")), Qt::LeftButton);
+            QCOMPARE(edit->text(), QString());
+            QCOMPARE(names(f), (QStringList{"Meier AG", "Meiser", "Muller, Eva", "Müller, Hans"}));
+            QCOMPARE(f.captionText(), QStringLiteral("Kontakte (Kontakt gefiltert nach \"M\")"));
+
+            // Closing removes the search and tells the main window.
+            search(f, QStringLiteral("Bio"));
+            QCOMPARE(names(f), QStringList{});
+            env.host().got.clear();
+            QTest::mouseClick(f.findChild<QPushButton*>(QStringLiteral("AdvCloseSearchPan")), Qt::LeftButton);
+            QVERIFY(!f.isSearchShown());
+            QCOMPARE(panel->height(), 1);
+            QCOMPARE(names(f).size(), 4);
+            QCOMPARE(f.footerText(), QStringLiteral(" Kontakte: 4"));
+            QTRY_COMPARE(env.host().got.size(), 1);
+            QCOMPARE(env.host().got[0].message, WMSEARCHUNCHECKED);
+
+            // Ctrl+F in the grid, and the main window's entry, which also closes it.
+            f.view()->setFocus();
+            QTest::keyClick(f.view(), Qt::Key_F, Qt::ControlModifier);
+            QVERIFY(f.isSearchShown());
+            QVERIFY(f.isActionEnabled(QStringLiteral("_LogFo_Search")));
+            f.executeAction(QStringLiteral("_LogFo_Search"));
+            QVERIFY(!f.isSearchShown());
+            QCOMPARE(env.dialogs().count(), 0);
+            f.DBDisconnect();
+        }
+        // Opened again with a letter filter stored: RzChB1 is checked, no search.
+        Tcontactlistframe g(&env.dm());
+        QVERIFY(g.DBConnect(&env.host()));
+        QCOMPARE(g.captionText(), QStringLiteral("Kontakte (Kontakt gefiltert nach \"M\")"));
+        QVERIFY(g.findChild<QCheckBox*>(QStringLiteral("RzChB1"))->isChecked());
+        QVERIFY(!g.controller()->isSearching());
+        g.searchPanel()->open();
+        search(g, QString());
+        QCOMPARE(env.dialogs().texts(DialogKind::Warning), QStringList{GridSearchPanel::missingInputWarning()});
+        g.DBDisconnect();
+    }
+
     void letterFilterCaptionsAndPatterns()
     {
         ContactTestEnv env;

@@ -32,6 +32,8 @@ public:
         return false;
     }
     virtual void executeAction(const QString& actionName) { Q_UNUSED(actionName); }
+    // Whether the list's search panel is open (the main window's search entry shows it checked).
+    [[nodiscard]] virtual bool isSearchShown() const { return false; }
 };
 
 } // namespace orvanta

@@ -133,6 +133,26 @@ unsigned char foldCase(unsigned char c)
     return c;
 }
 
+int searchFold(unsigned char c, char out[2])
+{
+    const Weight& w = table().w[c];
+    if (w.w2 != 0) {
+        // Expansions are letters: weight 0x300 + 2 * (letter - 'a').
+        out[0] = static_cast<char>('a' + (w.w1 - 0x300) / 2);
+        out[1] = static_cast<char>('a' + (w.w2 - 0x300) / 2);
+        return 2;
+    }
+    out[0] = static_cast<char>(foldCase(c));
+    return 1;
+}
+
+void appendSearchFold(QByteArrayView text, QByteArray& out)
+{
+    char buf[2];
+    for (const char ch : text)
+        out.append(buf, searchFold(static_cast<unsigned char>(ch), buf));
+}
+
 int compare(QByteArrayView a, QByteArrayView b)
 {
     {

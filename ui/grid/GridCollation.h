@@ -22,6 +22,13 @@ void appendSortKey(QByteArrayView text, QByteArray& out);
 // Latin-1 lower case of one byte.
 [[nodiscard]] unsigned char foldCase(unsigned char c);
 
+// The folding of a case-insensitive search: every byte in lower case (foldCase), and the
+// characters this order spells as two letters (ß as "ss", æ as "ae", þ as "th") as those
+// letters. Accents stay: "ü" is not "u", as two texts differing in an accent never compare equal.
+// Writes one or two bytes and returns how many.
+int searchFold(unsigned char c, char out[2]);
+void appendSearchFold(QByteArrayView text, QByteArray& out);
+
 // SQL LIKE: '%' any run, '_' one character. Case-sensitive unless asked otherwise.
 [[nodiscard]] bool like(QByteArrayView text, QByteArrayView pattern, bool caseSensitive = true);
 

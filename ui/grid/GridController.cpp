@@ -381,6 +381,12 @@ void GridController::setTodayProvider(std::function<QDate()> today)
     invalidate(DirtyFilter);
 }
 
+void GridController::setSearch(const GridSearch& search)
+{
+    if (m_rowFilter.setSearch(search))
+        invalidate(DirtyFilter);
+}
+
 QString GridController::filterText() const
 {
     return m_rowFilter.text(m_columns);

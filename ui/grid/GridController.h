@@ -111,6 +111,13 @@ public:
     void setTodayProvider(std::function<QDate()> today);
     [[nodiscard]] QDate today() const { return m_rowFilter.today(); }
 
+    // --- search --------------------------------------------------------------------------
+    // Rows where a chosen column holds the text, within or instead of the filter (GridSearch).
+    [[nodiscard]] const GridSearch& search() const { return m_rowFilter.search(); }
+    void setSearch(const GridSearch& search);
+    void clearSearch() { setSearch(GridSearch()); }
+    [[nodiscard]] bool isSearching() const { return m_rowFilter.search().isActive(); }
+
     // --- rows ------------------------------------------------------------------------------
     [[nodiscard]] int rowCount() const;
     // Data rows passing the filter, group rows not counted.

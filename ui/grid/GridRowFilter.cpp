@@ -102,7 +102,41 @@ QString GridRowFilter::text(const GridColumnStates& columns) const
     return itemText(columns, m_filter.root, true);
 }
 
+bool GridRowFilter::setSearch(const GridSearch& search)
+{
+    if (m_search == search)
+        return false;
+    m_search = search;
+    return true;
+}
+
 void GridRowFilter::apply(const GridSource& source, const GridColumnStates& columns, std::vector<quint32>& out) const
+{
+    if (!m_search.isActive()) {
+        applyFilter(source, columns, out);
+        return;
+    }
+    const GridSearchMatcher matcher(m_search, source, columns);
+    if (m_search.narrow) {
+        applyFilter(source, columns, out);
+        // Compacted in place: the rows stay ascending, nothing is copied.
+        size_t kept = 0;
+        for (const quint32 r : out) {
+            if (matcher.matches(r))
+                out[kept++] = r;
+        }
+        out.resize(kept);
+        return;
+    }
+    out.clear();
+    const quint32 n = source.rowCount();
+    for (quint32 r = 0; r < n; ++r) {
+        if (matcher.matches(r))
+            out.push_back(r);
+    }
+}
+
+void GridRowFilter::applyFilter(const GridSource& source, const GridColumnStates& columns, std::vector<quint32>& out) const
 {
     const quint32 n = source.rowCount();
     out.clear();

@@ -4,6 +4,7 @@
 
 #include "ui/grid/GridColumnState.h"
 #include "ui/grid/GridFilter.h"
+#include "ui/grid/GridSearch.h"
 
 #include <QDate>
 #include <functional>
@@ -22,17 +23,26 @@ public:
     void addItem(GridFilterItem item);
     bool clearItems();
 
+    // The search beside the filter; inactive when it has no text or no column. Returns whether
+    // anything changed.
+    [[nodiscard]] const GridSearch& search() const { return m_search; }
+    bool setSearch(const GridSearch& search);
+
     // nullptr: the program clock.
     void setTodayProvider(std::function<QDate()> today);
     [[nodiscard]] QDate today() const { return m_today(); }
 
     // "TSDATE is this week", "(CONTBEZ LIKE 'A%' OR CONTBEZ LIKE 'a%')"; empty without items.
     [[nodiscard]] QString text(const GridColumnStates& columns) const;
-    // Source rows passing the filter, ascending; every row when it is inactive or empty.
+    // Source rows passing the filter, ascending; every row when it is inactive or empty. An
+    // active search then keeps the rows it finds: among those (narrowing) or among all rows.
     void apply(const GridSource& source, const GridColumnStates& columns, std::vector<quint32>& out) const;
 
 private:
+    void applyFilter(const GridSource& source, const GridColumnStates& columns, std::vector<quint32>& out) const;
+
     GridFilter m_filter;
+    GridSearch m_search;
     std::function<QDate()> m_today;
 };
 
