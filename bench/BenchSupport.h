@@ -10,15 +10,20 @@
 #include "db/Schema.h"
 #include "db/SqlScript.h"
 #include "db/TDM2.h"
+#include "platform/ProgramFolder.h"
 #include "platform/Registry.h"
 
 #include <QDir>
+#include <QElapsedTimer>
+#include <QTemporaryDir>
 #include <QFile>
 #include <QStringList>
 #include <QString>
 
 #include <cstdio>
 #include <cstring>
+#include <limits>
+#include <memory>
 #include <optional>
 
 namespace orvanta::bench {
@@ -70,6 +75,21 @@ inline QString tempFolderPattern(const QString& folder, const char* program)
 {
     return (folder.isEmpty() ? QDir::tempPath() : folder) + QLatin1Char('/') + QLatin1String(program)
         + QStringLiteral("-XXXXXX");
+}
+
+// The run's temporary folder, made the program folder with a registry stand-in of its own, so
+// that no settings or layout file of an earlier run changes what is measured. Null (and said
+// why) when it cannot be made.
+inline std::unique_ptr<QTemporaryDir> benchProgramFolder(const QString& folder, const char* program)
+{
+    auto temp = std::make_unique<QTemporaryDir>(tempFolderPattern(folder, program));
+    if (!temp->isValid()) {
+        std::fprintf(stderr, "no temporary folder\n");
+        return nullptr;
+    }
+    qputenv("VARNIK_HKLM", temp->filePath(QStringLiteral("hklm.ini")).toLocal8Bit());
+    setProgramFolder(temp->path());
+    return temp;
 }
 
 // A new database with the program's schema, filled by 'fill' and closed again.
@@ -165,6 +185,20 @@ inline RawResult rawFetch(FbAttachment& db, FbTransaction& tx, const QString& sq
     }
     tx.commit();
     return r;
+}
+
+// The baseline: the best of three raw fetches after one that warms the page cache, in ns.
+inline qint64 bestRawFetch(FbAttachment& db, FbTransaction& tx, const QString& sql = QStringLiteral("SELECT * FROM LOG"))
+{
+    rawFetch(db, tx, sql);
+    qint64 best = std::numeric_limits<qint64>::max();
+    for (int run = 0; run < 3; ++run) {
+        QElapsedTimer t;
+        t.start();
+        rawFetch(db, tx, sql);
+        best = std::min(best, t.nsecsElapsed());
+    }
+    return best;
 }
 
 } // namespace orvanta::bench

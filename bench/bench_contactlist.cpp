@@ -134,13 +134,9 @@ int main(int argc, char* argv[])
     const std::optional<RunOptions> options = runOptions(app.arguments(), "bench_contactlist");
     if (!options)
         return 2;
-    QTemporaryDir temp(tempFolderPattern(options->folder, "bench_contactlist"));
-    if (!temp.isValid()) {
-        std::fprintf(stderr, "no temporary folder\n");
+    const std::unique_ptr<QTemporaryDir> temp = benchProgramFolder(options->folder, "bench_contactlist");
+    if (!temp)
         return 1;
-    }
-    qputenv("VARNIK_HKLM", temp.filePath(QStringLiteral("hklm.ini")).toLocal8Bit());
-    setProgramFolder(temp.path());
     const QString rawSql = QString::fromLatin1(dmsql::kSelectContactList);
 
     std::printf("Contact list, times as ratios to the raw fetch of \"%s\" (best of 3) in the same run\n",
@@ -152,10 +148,10 @@ int main(int argc, char* argv[])
     for (const int contacts : {1'000, 10'000, 100'000}) {
         if (contacts > options->maxCalls)
             break;
-        const QString path = temp.filePath(QStringLiteral("contacts%1.fdb").arg(contacts));
+        const QString path = temp->filePath(QStringLiteral("contacts%1.fdb").arg(contacts));
         // Each size starts as a first start: no layout files of the size before.
         for (const char* f : {"VStore", "VStoreT", "VStoreC"})
-            QFile::remove(temp.filePath(QLatin1String(f)));
+            QFile::remove(temp->filePath(QLatin1String(f)));
         try {
             createLogDatabase(path, [contacts](FbAttachment& db) { generateContacts(db, contacts, 4711); });
             pointDataModuleAt(path);
@@ -164,18 +160,8 @@ int main(int argc, char* argv[])
                 std::fprintf(stderr, "cannot connect to %s\n", qPrintable(path));
                 return 1;
             }
-            rawFetch(dm.IBDatabase1, dm.ibta2, rawSql); // warm the page cache
-            qint64 raw = std::numeric_limits<qint64>::max();
-            qint64 unsorted = std::numeric_limits<qint64>::max();
-            for (int run = 0; run < 3; ++run) {
-                QElapsedTimer t;
-                t.start();
-                rawFetch(dm.IBDatabase1, dm.ibta2, rawSql);
-                raw = std::min(raw, t.nsecsElapsed());
-                t.restart();
-                rawFetch(dm.IBDatabase1, dm.ibta2, QStringLiteral("SELECT * FROM V_SELECT_LIST"));
-                unsorted = std::min(unsorted, t.nsecsElapsed());
-            }
+            const qint64 raw = bestRawFetch(dm.IBDatabase1, dm.ibta2, rawSql);
+            const qint64 unsorted = bestRawFetch(dm.IBDatabase1, dm.ibta2, QStringLiteral("SELECT * FROM V_SELECT_LIST"));
 
             QObject host;
             Tcontactlistframe frame(&dm);

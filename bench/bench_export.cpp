@@ -34,13 +34,9 @@ int main(int argc, char* argv[])
         return 2;
     const qint64 maxCalls = options->maxCalls;
     const QString folder = options->folder;
-    QTemporaryDir temp(tempFolderPattern(folder, "bench_export"));
-    if (!temp.isValid()) {
-        std::fprintf(stderr, "no temporary folder\n");
+    const std::unique_ptr<QTemporaryDir> temp = benchProgramFolder(folder, "bench_export");
+    if (!temp)
         return 1;
-    }
-    qputenv("VARNIK_HKLM", temp.filePath(QStringLiteral("hklm.ini")).toLocal8Bit());
-    setProgramFolder(temp.path());
 
     std::printf("Export of the log list, times as ratios to the raw fetch of SELECT * FROM LOG (best of 3) in the same run\n");
     std::printf("%9s %9s | %7s %7s %7s %7s | %9s %9s\n", "calls", "raw ms", "html", "xls", "xml", "txt", "file MiB",
@@ -49,7 +45,7 @@ int main(int argc, char* argv[])
     for (const qint64 calls : {qint64(10'000), qint64(100'000), qint64(1'000'000)}) {
         if (calls > maxCalls)
             break;
-        const QString path = temp.filePath(QStringLiteral("log%1.fdb").arg(calls));
+        const QString path = temp->filePath(QStringLiteral("log%1.fdb").arg(calls));
         try {
             createLogDatabase(path,
                               [calls, &lastDay](FbAttachment& db) { demo::generateCalls(db, calls, 4711, lastDay); });
@@ -59,14 +55,7 @@ int main(int argc, char* argv[])
                 std::fprintf(stderr, "cannot connect to %s\n", qPrintable(path));
                 return 1;
             }
-            rawFetch(dm.IBDatabase1, dm.logts);
-            qint64 raw = std::numeric_limits<qint64>::max();
-            for (int run = 0; run < 3; ++run) {
-                QElapsedTimer t;
-                t.start();
-                rawFetch(dm.IBDatabase1, dm.logts);
-                raw = std::min(raw, t.nsecsElapsed());
-            }
+            const qint64 raw = bestRawFetch(dm.IBDatabase1, dm.logts);
             QObject host;
             Tlogframe frame(&dm);
             frame.Firstep(&host);
@@ -79,7 +68,7 @@ int main(int argc, char* argv[])
             qint64 rssGrowth = 0;
             int i = 0;
             for (const ExportFormat f : {ExportFormat::Html, ExportFormat::Excel, ExportFormat::Xml, ExportFormat::Text}) {
-                const QString file = temp.filePath(QStringLiteral("out.") + exportExtension(f));
+                const QString file = temp->filePath(QStringLiteral("out.") + exportExtension(f));
                 const qint64 rssBefore = residentKiB();
                 GridSnapshot snapshot(*g, excluded);
                 QElapsedTimer t;

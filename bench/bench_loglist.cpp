@@ -78,14 +78,9 @@ int main(int argc, char* argv[])
         return 2;
     const qint64 maxCalls = options->maxCalls;
     const QString folder = options->folder;
-    QTemporaryDir temp(tempFolderPattern(folder, "bench_loglist"));
-    if (!temp.isValid()) {
-        std::fprintf(stderr, "no temporary folder\n");
+    const std::unique_ptr<QTemporaryDir> temp = benchProgramFolder(folder, "bench_loglist");
+    if (!temp)
         return 1;
-    }
-    qputenv("VARNIK_HKLM", temp.filePath(QStringLiteral("hklm.ini")).toLocal8Bit());
-    // No layout file of an earlier run (or size) may change what is measured.
-    setProgramFolder(temp.path());
 
     std::printf("Log list, times as ratios to the raw fetch of SELECT * FROM LOG (best of 3) in the same run\n");
     std::printf("%9s %9s | %7s %7s %7s %7s %7s %7s | %8s %8s %8s %8s | %9s %9s\n", "calls", "raw ms", "open", "sort",
@@ -95,7 +90,7 @@ int main(int argc, char* argv[])
     for (const qint64 calls : {qint64(10'000), qint64(100'000), qint64(1'000'000)}) {
         if (calls > maxCalls)
             break;
-        const QString path = temp.filePath(QStringLiteral("log%1.fdb").arg(calls));
+        const QString path = temp->filePath(QStringLiteral("log%1.fdb").arg(calls));
         try {
             createLogDatabase(path,
                               [calls, &lastDay](FbAttachment& db) { demo::generateCalls(db, calls, 4711, lastDay); });
@@ -106,14 +101,7 @@ int main(int argc, char* argv[])
                 std::fprintf(stderr, "cannot connect to %s\n", qPrintable(path));
                 return 1;
             }
-            rawFetch(dm.IBDatabase1, dm.logts); // warm the page cache
-            qint64 raw = std::numeric_limits<qint64>::max();
-            for (int run = 0; run < 3; ++run) {
-                QElapsedTimer t;
-                t.start();
-                rawFetch(dm.IBDatabase1, dm.logts);
-                raw = std::min(raw, t.nsecsElapsed());
-            }
+            const qint64 raw = bestRawFetch(dm.IBDatabase1, dm.logts);
 
             if (qEnvironmentVariableIsSet("BENCH_LOGLIST_DETAIL")) {
                 QElapsedTimer d;

@@ -44,16 +44,12 @@ int main(int argc, char* argv[])
     const std::optional<RunOptions> options = runOptions(app.arguments(), "bench_print");
     if (!options)
         return 2;
-    QTemporaryDir temp(tempFolderPattern(options->folder, "bench_print"));
-    if (!temp.isValid()) {
-        std::fprintf(stderr, "no temporary folder\n");
+    const std::unique_ptr<QTemporaryDir> temp = benchProgramFolder(options->folder, "bench_print");
+    if (!temp)
         return 1;
-    }
-    qputenv("VARNIK_HKLM", temp.filePath(QStringLiteral("hklm.ini")).toLocal8Bit());
-    setProgramFolder(temp.path());
     // The report file the build puts beside the programs.
     if (!QFile::copy(QCoreApplication::applicationDirPath() + QStringLiteral("/Orvex.rav"),
-                     temp.filePath(QStringLiteral("Orvex.rav")))) {
+                     temp->filePath(QStringLiteral("Orvex.rav")))) {
         std::fprintf(stderr, "no Orvex.rav beside the program\n");
         return 1;
     }
@@ -65,7 +61,7 @@ int main(int argc, char* argv[])
     for (const qint64 calls : {qint64(10'000), qint64(100'000), qint64(1'000'000)}) {
         if (calls > options->maxCalls)
             break;
-        const QString path = temp.filePath(QStringLiteral("log%1.fdb").arg(calls));
+        const QString path = temp->filePath(QStringLiteral("log%1.fdb").arg(calls));
         try {
             createLogDatabase(path,
                               [calls, &lastDay](FbAttachment& db) { demo::generateCalls(db, calls, 4711, lastDay); });
@@ -75,14 +71,7 @@ int main(int argc, char* argv[])
                 std::fprintf(stderr, "cannot connect to %s\n", qPrintable(path));
                 return 1;
             }
-            rawFetch(dm.IBDatabase1, dm.logts);
-            qint64 raw = std::numeric_limits<qint64>::max();
-            for (int run = 0; run < 3; ++run) {
-                QElapsedTimer t;
-                t.start();
-                rawFetch(dm.IBDatabase1, dm.logts);
-                raw = std::min(raw, t.nsecsElapsed());
-            }
+            const qint64 raw = bestRawFetch(dm.IBDatabase1, dm.logts);
 
             QElapsedTimer t;
             qint64 first = 0;
@@ -97,7 +86,7 @@ int main(int argc, char* argv[])
             if (!LogPrint(&dm.rave_ibsql, 0, outcome, QDate(), QDate()))
                 throw std::runtime_error(qPrintable(outcome.message));
 
-            const QString pdf = temp.filePath(QStringLiteral("log.pdf"));
+            const QString pdf = temp->filePath(QStringLiteral("log.pdf"));
             int pages = 0;
             setReportPreviewHook([&](ReportLayout& layout, const QString&) {
                 ReportRenderer::writePdf(pdf, layout);
