@@ -225,6 +225,9 @@ TRavePreviewF::TRavePreviewF(ReportLayout& layout, const QString& title, QWidget
 
 TRavePreviewF::~TRavePreviewF()
 {
+    // Closing the window moves the focus out of the page edit, whose "editingFinished" would
+    // otherwise reach this window while QWidget's destructor runs.
+    m_pageEdit->disconnect(this);
     delete m_printDialog;
 }
 
