@@ -62,6 +62,15 @@ void IniFile::parse(QByteArrayView bytes)
     m_sectionIndex.clear();
     m_prelude.clear();
 
+    // NUL bytes carry nothing in a text file. They go before the byte-order mark is looked for:
+    // dropped later, NULs in front of a mark would turn it into text that reads as a mark once
+    // the file is written back.
+    QByteArray withoutNuls;
+    if (bytes.contains('\0')) {
+        withoutNuls = bytes.toByteArray();
+        withoutNuls.removeIf([](char c) { return c == '\0'; });
+        bytes = withoutNuls;
+    }
     QString text;
     m_utf8Bom = bytes.startsWith("\xEF\xBB\xBF");
     if (m_utf8Bom) {
@@ -70,8 +79,6 @@ void IniFile::parse(QByteArrayView bytes)
     } else {
         text = fromWindows1252(bytes);
     }
-    // NUL bytes carry nothing in a text file; dropping them first keeps names trimmable.
-    text.remove(QChar(0));
 
     Section* current = nullptr;
     bool currentIsDuplicate = false;

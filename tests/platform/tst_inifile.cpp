@@ -89,6 +89,16 @@ private Q_SLOTS:
         QCOMPARE(ini.readString(QStringLiteral("S"), QStringLiteral("key")), QStringLiteral("value"));
         QCOMPARE(ini.readString(QStringLiteral("unterminated"), QStringLiteral("k")), QStringLiteral("2"));
         QCOMPARE(ini.sections().size(), 2);
+
+        // NULs in front of a byte-order mark: read as the UTF-8 file it is, and the same again
+        // after writing (the mark must not become text that reads as a mark the second time).
+        IniFile marked;
+        marked.parse(QByteArray("\x00\xEF\xBB\xBF[S]\r\nk=\xC3\xA4", 13));
+        QCOMPARE(marked.readString(QStringLiteral("S"), QStringLiteral("k")), QString::fromUtf8("ä"));
+        IniFile reread;
+        reread.parse(marked.serialize());
+        QCOMPARE(reread.sections(), marked.sections());
+        QCOMPARE(reread.readString(QStringLiteral("S"), QStringLiteral("k")), QString::fromUtf8("ä"));
     }
 
     void roundTripIsWindows1252WithCrLf()
