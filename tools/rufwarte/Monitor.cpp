@@ -4,12 +4,15 @@
 #include "db/CredentialCipher.h"
 #include "db/FbAttachment.h"
 #include "db/FbStatement.h"
+#include "db/DatabaseError.h"
 #include "db/FbTransaction.h"
+#include "db/TransactionWork.h"
 #include "phone/AreaCodes.h"
 #include "platform/AppException.h"
 #include "platform/NamedMutex.h"
 #include "platform/Registry.h"
 #include "tools/demo/CallFactory.h"
+#include "tools/rufwarte/RouterSource.h"
 
 #include <QDateTime>
 #include <QFileInfo>
@@ -28,6 +31,8 @@ QString regionOf(const QString& number)
     QString rest;
     QString region;
     QString n = number;
+    if (n.startsWith(QLatin1Char('+')))
+        n = QLatin1String("00") + n.mid(1);
     if (n.startsWith(QLatin1String("0043")) && GetAustriaAereaCodes(QStringView(n).mid(4), prefix, rest, region))
         return region;
     if (n.startsWith(QLatin1String("0041")) && GetSwissAereaCodes(QStringView(n).mid(4), prefix, rest, region))
@@ -40,13 +45,13 @@ QString regionOf(const QString& number)
     return {};
 }
 
+} // namespace
+
 void say(const QString& text)
 {
     std::fputs((text + QLatin1Char('\n')).toLocal8Bit().constData(), stdout);
     std::fflush(stdout);
 }
-
-} // namespace
 
 std::unique_ptr<FbAttachment> connectFromRegistry()
 {
@@ -60,51 +65,146 @@ std::unique_ptr<FbAttachment> connectFromRegistry()
     return db;
 }
 
+namespace {
+
+// Rows written by others (tests, imports) may have taken keys past the generator.
+int nextLogKey(FbAttachment& db, FbTransaction& tx)
+{
+    FbStatement key(db, &tx,
+                    QStringLiteral("SELECT GEN_ID(GEN_LOG_ID, 1), (SELECT COALESCE(MAX(LID), 0) FROM LOG) "
+                                   "FROM RDB$DATABASE"));
+    key.execute();
+    key.next();
+    int lid = key.asInt(0);
+    const int highest = key.asInt(1);
+    key.close();
+    if (lid <= highest) {
+        FbStatement skip(db, &tx, QStringLiteral("SELECT GEN_ID(GEN_LOG_ID, CAST(:STEP AS INTEGER)) FROM RDB$DATABASE"));
+        skip.setParam(u"STEP", highest - lid + 1);
+        skip.execute();
+        skip.next();
+        lid = skip.asInt(0);
+        skip.close();
+    }
+    return lid;
+}
+
+// Routers often report the own number with the area code in front of the MSN, or the MSN alone.
+QString msnName(const QList<MsnRecord>& msns, const QString& ownNumber)
+{
+    if (ownNumber.isEmpty())
+        return {};
+    for (const MsnRecord& r : msns)
+        if (r.MSN == ownNumber)
+            return r.Bezeichnung;
+    for (const MsnRecord& r : msns) {
+        if (r.MSN.size() >= 3 && (ownNumber.endsWith(r.MSN) || r.MSN.endsWith(ownNumber)))
+            return r.Bezeichnung;
+    }
+    return {};
+}
+
+QString statusText(const LoggedCall& call)
+{
+    if (call.answered)
+        return QStringLiteral("Verbunden");
+    return call.direction == LoggedCall::Outgoing ? QStringLiteral("Keine Antwort")
+                                                  : QStringLiteral("Anruf in Abwesenheit");
+}
+
+} // namespace
+
+QList<MsnRecord> programFolderMsns()
+{
+    TRufwarteIni ini;
+    ini.SetProgramFolderFiles();
+    return ini.MSNs();
+}
+
+WriteResult writeCall(FbAttachment& db, const LoggedCall& call, const QList<MsnRecord>& msns, int& lid, QString& error)
+{
+    // "nowait": a conflicting writer is reported at once and the caller tries again, instead of
+    // the monitor hanging behind a user's open transaction.
+    FbTransaction tx(db, {QStringLiteral("read_committed"), QStringLiteral("rec_version"), QStringLiteral("nowait"),
+                          QStringLiteral("write")},
+                     FbTransaction::EndAction::Rollback);
+    bool lockConflict = false;
+    error.clear();
+    const bool written = runInTransaction(
+        tx, u"# Rufwarte - Anruf protokollieren",
+        [&] {
+            try {
+                const bool withheld = call.number.isEmpty();
+                const QString number = withheld ? QString::fromUtf8("Nummer unterdrückt") : call.number;
+                QString callerText = number;
+                QString numberLabel;
+                int contact = 0;
+                if (!withheld) {
+                    FbStatement who(db, &tx, QStringLiteral("EXECUTE PROCEDURE P_SELECT_LOG_CONTACT(:PHONENR)"));
+                    who.setParam(u"PHONENR", call.number);
+                    who.execute();
+                    contact = who.asInt(3);
+                    if (contact > 0) {
+                        numberLabel = who.asString(1);
+                        callerText = who.asString(2);
+                    }
+                    who.close();
+                }
+                lid = nextLogKey(db, tx);
+                const QDateTime start = call.start.isValid() ? call.start : QDateTime::currentDateTime();
+                const QTime time(start.time().hour(), start.time().minute(), start.time().second());
+                FbStatement insert(
+                    db, &tx,
+                    QStringLiteral("INSERT INTO LOG (LID, SERVICE, FROMPHONE, FROMBEZ, ONMSN, ONBEZ, STATUS, TSDATE, "
+                                   "TSTIME, TS, CID, CTYPE, CTIME, REGION, FROMANSCHLUSS, NTYPE, NPLAN, PRESENT) "
+                                   "VALUES (:LID, 1, :FP, :FB, :MSN, :ONBEZ, :STATUS, :D, :T, :TS, :CID, :CTYPE, "
+                                   ":CTIME, :REGION, :FA, :NTYPE, 1, :PRESENT)"));
+                insert.setParam(u"LID", lid);
+                insert.setParam(u"FP", number.left(25));
+                insert.setParam(u"FB", callerText.left(80));
+                insert.setParam(u"MSN", call.ownNumber.left(25));
+                const QString onBez = msnName(msns, call.ownNumber);
+                insert.setParam(u"ONBEZ", onBez.isEmpty() ? QVariant() : QVariant(onBez.left(30)));
+                insert.setParam(u"STATUS", statusText(call));
+                insert.setParam(u"D", start.date());
+                insert.setParam(u"T", time);
+                insert.setParam(u"TS", QDateTime(start.date(), time));
+                insert.setParam(u"CID", contact > 0 ? contact : 0);
+                insert.setParam(u"CTYPE", call.direction);
+                // The column holds a time of day: a call of a day or more shows as 23:59:59.
+                insert.setParam(u"CTIME", QTime(0, 0).addSecs(qBound(0, call.durationSeconds, 86399)));
+                const QString region = withheld ? QString() : regionOf(call.number);
+                insert.setParam(u"REGION", region.isEmpty() ? QVariant() : QVariant(region.left(35)));
+                insert.setParam(u"FA", numberLabel.isEmpty() ? QVariant() : QVariant(numberLabel.left(30)));
+                insert.setParam(u"NTYPE", withheld ? 0 : 2);
+                insert.setParam(u"PRESENT", withheld ? 1 : 0);
+                insert.execute();
+            } catch (const AppException& e) {
+                const auto* dbError = dynamic_cast<const DatabaseError*>(&e);
+                lockConflict = dbError && dbError->isLockConflict();
+                error = e.message();
+                throw;
+            }
+        },
+        ErrorReport::Log);
+    if (written)
+        return WriteResult::Written;
+    if (error.isEmpty())
+        error = QStringLiteral("Die Datenbank hat den Anruf nicht angenommen.");
+    return lockConflict ? WriteResult::LockConflict : WriteResult::Failed;
+}
+
 int insertCall(FbAttachment& db, const QString& fromPhone, const QString& onMsn)
 {
-    FbTransaction tx(db);
-    tx.start();
-    try {
-        // Rows written by others (tests, imports) may have taken keys past the generator.
-        FbStatement key(db, &tx,
-                        QStringLiteral("SELECT GEN_ID(GEN_LOG_ID, 1), (SELECT COALESCE(MAX(LID), 0) FROM LOG) "
-                                       "FROM RDB$DATABASE"));
-        key.execute();
-        key.next();
-        int lid = key.asInt(0);
-        const int highest = key.asInt(1);
-        key.close();
-        if (lid <= highest) {
-            FbStatement skip(db, &tx, QStringLiteral("SELECT GEN_ID(GEN_LOG_ID, CAST(:STEP AS INTEGER)) FROM RDB$DATABASE"));
-            skip.setParam(u"STEP", highest - lid + 1);
-            skip.execute();
-            skip.next();
-            lid = skip.asInt(0);
-            skip.close();
-        }
-        const QDateTime now = QDateTime::currentDateTime();
-        const QTime time(now.time().hour(), now.time().minute(), now.time().second());
-        FbStatement insert(db, &tx,
-                           QStringLiteral("INSERT INTO LOG (LID, SERVICE, FROMPHONE, FROMBEZ, ONMSN, ONBEZ, STATUS, "
-                                          "TSDATE, TSTIME, TS, CTYPE, REGION, NTYPE, NPLAN, PRESENT) VALUES (:LID, 1, "
-                                          ":FP, '', :MSN, :ONBEZ, :STATUS, :D, :T, :TS, 0, :REGION, 2, 1, 0)"));
-        insert.setParam(u"LID", lid);
-        insert.setParam(u"FP", fromPhone);
-        insert.setParam(u"MSN", onMsn);
-        insert.setParam(u"ONBEZ", onMsn.isEmpty() ? QString() : QStringLiteral("Büro"));
-        insert.setParam(u"STATUS", QStringLiteral("Anruf in Abwesenheit"));
-        insert.setParam(u"D", now.date());
-        insert.setParam(u"T", time);
-        insert.setParam(u"TS", QDateTime(now.date(), time));
-        const QString region = regionOf(fromPhone);
-        insert.setParam(u"REGION", region.isEmpty() ? QVariant() : QVariant(region.left(35)));
-        insert.execute();
-        tx.commit();
-        return lid;
-    } catch (...) {
-        tx.rollbackQuietly();
-        throw;
-    }
+    LoggedCall call;
+    call.number = fromPhone;
+    call.ownNumber = onMsn;
+    call.start = QDateTime::currentDateTime();
+    int lid = 0;
+    QString error;
+    if (writeCall(db, call, programFolderMsns(), lid, error) != WriteResult::Written)
+        throw AppException(error);
+    return lid;
 }
 
 Monitor::Monitor()
@@ -205,6 +305,14 @@ bool Monitor::tellProgram(int message, qint64 wParam)
     return MonitorLink::sendLine(MonitorLink::programSocketPath(), message, wParam, 0);
 }
 
+void Monitor::watchRouter(RouterSource* source)
+{
+    m_router = source;
+    source->setParent(this);
+    source->setPaused(m_paused);
+    source->start();
+}
+
 int Monitor::logCall(const QString& fromPhone, const QString& onMsn, bool postMessage)
 {
     if (m_paused) {
@@ -255,6 +363,8 @@ void Monitor::handleLine(const QByteArray& line, QLocalSocket* socket)
         Q_EMIT quitRequested();
     } else if (message == MonitorLink::MonitorPauseResume) {
         m_paused = !m_paused;
+        if (m_router)
+            m_router->setPaused(m_paused);
         say(m_paused ? QStringLiteral("Rufwarte angehalten.") : QStringLiteral("Rufwarte fortgesetzt."));
     }
 }
