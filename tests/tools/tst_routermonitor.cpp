@@ -153,7 +153,8 @@ private Q_SLOTS:
         QTRY_COMPARE(program.got.size(), 6);
         for (const auto& got : std::as_const(program.got)) {
             QCOMPARE(got.message, WMLOGINFOCHANGE);
-            QCOMPARE(env.db().scalar(QStringLiteral("SELECT COUNT(*) FROM LOG WHERE LID = %1").arg(got.wParam)).toInt(), 1);
+            const QString sql = QStringLiteral("SELECT COUNT(*) FROM LOG WHERE LID = %1").arg(got.wParam);
+            QCOMPARE(env.db().scalar(sql).toInt(), 1);
         }
 
         // What it passed over, it said.
@@ -161,6 +162,70 @@ private Q_SLOTS:
         const QString out = QString::fromLocal8Bit(output);
         QVERIFY2(out.contains(QStringLiteral("welcome to the router")), qPrintable(out));
         QVERIFY2(out.contains(QStringLiteral("DISCONNECT ohne RING")), qPrintable(out));
+    }
+
+    void callsWaitForTheDatabaseAndOutliveTheMonitor()
+    {
+        QVERIFY2(QFileInfo::exists(rufwarteProgram()), "the rufwarte program is missing from the build");
+        ProgramTestEnv env(QDateTime(QDate(2026, 12, 7), QTime(12, 0)), ProgramTestEnv::ErrorLogSetup::None);
+        // The database is out of reach while the calls come in.
+        const QString away = env.file(QStringLiteral("away.fdb"));
+        QVERIFY(QFile::rename(env.db().path(), away));
+        const QString queueFile = env.file(QStringLiteral("CallQueue"));
+
+        QTcpServer router;
+        QVERIFY(router.listen(QHostAddress::LocalHost));
+        const QStringList args{QStringLiteral("run"), QStringLiteral("--program-folder"), env.folder(),
+                               QStringLiteral("--router"), QStringLiteral("127.0.0.1:%1").arg(router.serverPort()),
+                               QStringLiteral("--retry-ms"), QStringLiteral("100")};
+        QProcess monitor;
+        monitor.setProcessChannelMode(QProcess::MergedChannels);
+        QByteArray output;
+        connect(&monitor, &QProcess::readyRead, this, [&] { output += monitor.readAll(); });
+        const auto cleanup = qScopeGuard([&monitor] {
+            monitor.kill();
+            monitor.waitForFinished(10000);
+            monitor.disconnect();
+        });
+        monitor.start(rufwarteProgram(), args);
+        QVERIFY2(router.waitForNewConnection(15000), output.constData());
+        QTcpSocket* line = router.nextPendingConnection();
+        line->write("07.12.26 09:10:00;RING;1;0891234567;3012345671;SIP1;\n"
+                    "07.12.26 09:10:30;DISCONNECT;1;0;\n"
+                    "07.12.26 09:20:00;CALL;2;1;3012345670;030987654;SIP0;\n"
+                    "07.12.26 09:20:08;CONNECT;2;1;030987654;\n"
+                    "07.12.26 09:21:08;DISCONNECT;2;60;\n");
+        QVERIFY(line->waitForBytesWritten(5000));
+        const auto queued = [&queueFile] {
+            QFile f(queueFile);
+            return f.open(QIODevice::ReadOnly) ? f.readAll().count('\n') : qsizetype(-1);
+        };
+        QTRY_COMPARE_WITH_TIMEOUT(queued(), qsizetype(2), 15000);
+        QVERIFY2(output.contains("Keine Verbindung zur Datenbank"), output.constData());
+
+        // The monitor dies without a word; the first call had reached the log before it did.
+        monitor.kill();
+        QVERIFY(monitor.waitForFinished(10000));
+        QVERIFY(QFile::rename(away, env.db().path()));
+        env.db().exec(QStringLiteral(
+            "INSERT INTO LOG (LID, FROMPHONE, ONMSN, CTYPE, CTIME, TS, TSDATE, TSTIME) VALUES "
+            "(1, '0891234567', '3012345671', 0, '00:00:00', '2026-12-07 09:10:00', '2026-12-07', '09:10:00')"));
+        QFile junk(queueFile);
+        QVERIFY(junk.open(QIODevice::Append));
+        junk.write("not a call\n2026-12-07T09:00:00\t7\t0\t0\t030\t301\n");
+        junk.close();
+
+        // The next start writes what waited, once, and says what it passed over.
+        output.clear();
+        monitor.start(rufwarteProgram(), args);
+        QTRY_VERIFY_WITH_TIMEOUT(!QFileInfo::exists(queueFile), 15000);
+        QCOMPARE(env.db().scalar(QStringLiteral("SELECT COUNT(*) FROM LOG")).toInt(), 2);
+        QCOMPARE(env.db()
+                     .scalar(QStringLiteral("SELECT STATUS || '|' || FROMBEZ || '|' || CTYPE FROM LOG "
+                                            "WHERE FROMPHONE = '030987654' AND CTIME = '00:01:00'"))
+                     .toString(),
+                 QStringLiteral("Verbunden|030987654|1"));
+        QTRY_VERIFY2(output.contains("2 unlesbare Zeilen"), output.constData());
     }
 
     void aBadRouterAddressIsRefused()

@@ -136,6 +136,25 @@ WriteResult writeCall(FbAttachment& db, const LoggedCall& call, const QList<MsnR
             try {
                 const bool withheld = call.number.isEmpty();
                 const QString number = withheld ? QString::fromUtf8("Nummer unterdrückt") : call.number;
+                const QDateTime start = call.start.isValid() ? call.start : QDateTime::currentDateTime();
+                const QTime time(start.time().hour(), start.time().minute(), start.time().second());
+                const QTime talkTime = QTime(0, 0).addSecs(qBound(0, call.durationSeconds, 86399));
+                if (call.mayBeLogged) {
+                    FbStatement same(db, &tx,
+                                     QStringLiteral("SELECT FIRST 1 LID FROM LOG WHERE TS = :TS AND CTYPE = :CTYPE "
+                                                    "AND CTIME = :CTIME AND FROMPHONE = :FP AND ONMSN = :MSN"));
+                    same.setParam(u"TS", QDateTime(start.date(), time));
+                    same.setParam(u"CTYPE", call.direction);
+                    same.setParam(u"CTIME", talkTime);
+                    same.setParam(u"FP", number.left(25));
+                    same.setParam(u"MSN", call.ownNumber.left(25));
+                    same.execute();
+                    if (same.next()) {
+                        lid = same.asInt(0);
+                        return;
+                    }
+                    same.close();
+                }
                 QString callerText = number;
                 QString numberLabel;
                 int contact = 0;
@@ -151,8 +170,6 @@ WriteResult writeCall(FbAttachment& db, const LoggedCall& call, const QList<MsnR
                     who.close();
                 }
                 lid = nextLogKey(db, tx);
-                const QDateTime start = call.start.isValid() ? call.start : QDateTime::currentDateTime();
-                const QTime time(start.time().hour(), start.time().minute(), start.time().second());
                 FbStatement insert(
                     db, &tx,
                     QStringLiteral("INSERT INTO LOG (LID, SERVICE, FROMPHONE, FROMBEZ, ONMSN, ONBEZ, STATUS, TSDATE, "
@@ -172,7 +189,7 @@ WriteResult writeCall(FbAttachment& db, const LoggedCall& call, const QList<MsnR
                 insert.setParam(u"CID", contact > 0 ? contact : 0);
                 insert.setParam(u"CTYPE", call.direction);
                 // The column holds a time of day: a call of a day or more shows as 23:59:59.
-                insert.setParam(u"CTIME", QTime(0, 0).addSecs(qBound(0, call.durationSeconds, 86399)));
+                insert.setParam(u"CTIME", talkTime);
                 const QString region = withheld ? QString() : regionOf(call.number);
                 insert.setParam(u"REGION", region.isEmpty() ? QVariant() : QVariant(region.left(35)));
                 insert.setParam(u"FA", numberLabel.isEmpty() ? QVariant() : QVariant(numberLabel.left(30)));
@@ -232,7 +249,7 @@ bool Monitor::isRunning()
         || MonitorLink::sendLine(MonitorLink::monitorSocketPath(), 0, 0, 0, 300);
 }
 
-bool Monitor::start(QString& error)
+bool Monitor::start(QString& error, DatabaseAtStart database)
 {
     auto instance = std::make_unique<NamedMutex>(QString::fromLatin1(MutexName));
     // The mutex dies with its holder; a socket that still answers belongs to a monitor that
@@ -246,7 +263,11 @@ bool Monitor::start(QString& error)
         m_db = connectFromRegistry();
     } catch (const AppException& e) {
         error = QStringLiteral("Keine Verbindung zur Datenbank: ") + e.message();
-        return false;
+        if (database == DatabaseAtStart::Required)
+            return false;
+        // Calls from a router wait for the database; the next call tries again.
+        say(error);
+        error.clear();
     }
     if (!listen(error))
         return false;
@@ -320,6 +341,8 @@ int Monitor::logCall(const QString& fromPhone, const QString& onMsn, bool postMe
         return 0;
     }
     try {
+        if (!m_db)
+            m_db = connectFromRegistry();
         const int lid = insertCall(*m_db, fromPhone, onMsn);
         say(QStringLiteral("Anruf von %1 protokolliert (LID %2).").arg(fromPhone).arg(lid));
         tellProgram(postMessage ? MonitorLink::MonitorLogChangedPost : MonitorLink::MonitorLogChangedSend, lid);

@@ -36,8 +36,10 @@ public:
     // Whether a monitor runs now (holds the mutex, or answers on the socket).
     [[nodiscard]] static bool isRunning();
 
+    enum class DatabaseAtStart { Required, MayFollow };
     // Connects with the registry's connection data and opens the socket; false with a message.
-    bool start(QString& error);
+    // MayFollow: a database out of reach is reported and tried again when there is a call.
+    bool start(QString& error, DatabaseAtStart database = DatabaseAtStart::Required);
     [[nodiscard]] bool isPaused() const { return m_paused; }
     // Logs a random call every few seconds (0 = never).
     void setAutoCallInterval(int seconds);
@@ -78,6 +80,9 @@ struct LoggedCall {
     bool answered = false;
     QDateTime start;
     int durationSeconds = 0;
+    // Read back from the queue file: it may have been written just before the monitor ended, so
+    // an identical row means it is logged already.
+    bool mayBeLogged = false;
 };
 
 enum class WriteResult {

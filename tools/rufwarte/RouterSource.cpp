@@ -4,6 +4,9 @@
 #include "platform/AppException.h"
 #include "platform/MonitorLink.h"
 
+#include <QFile>
+#include <QFileInfo>
+#include <QSaveFile>
 #include <QSignalBlocker>
 
 #include <algorithm>
@@ -11,6 +14,9 @@
 namespace orvanta::rufwarte {
 
 namespace {
+
+// A queue file is a few lines; one that is not is no queue file of ours.
+constexpr qint64 QueueFileLimit = 16 * 1024 * 1024;
 
 LoggedCall loggedCall(const RouterCall& call)
 {
@@ -41,7 +47,7 @@ QString seconds(int ms)
 } // namespace
 
 RouterSource::RouterSource(QString host, quint16 port, Connector connector, QList<MsnRecord> msns, Timing timing,
-                           QObject* parent)
+                           QString queueFile, QObject* parent)
     : QObject(parent)
     , m_host(std::move(host))
     , m_port(port)
@@ -49,8 +55,18 @@ RouterSource::RouterSource(QString host, quint16 port, Connector connector, QLis
     , m_msns(std::move(msns))
     , m_timing(timing)
     , m_routerDelay(timing.firstRetryMs)
+    , m_queueFile(std::move(queueFile))
     , m_dbDelay(timing.firstRetryMs)
 {
+    QFile file(m_queueFile);
+    if (!m_queueFile.isEmpty() && file.open(QIODevice::ReadOnly)) {
+        int skipped = 0;
+        m_queue = decodeQueue(file.read(QueueFileLimit), &skipped);
+        if (!m_queue.isEmpty())
+            say(QStringLiteral("%1 Anrufe aus \"%2\" warten auf die Datenbank.").arg(m_queue.size()).arg(m_queueFile));
+        if (skipped > 0)
+            say(QStringLiteral("%1 unlesbare Zeilen in \"%2\" übergangen.").arg(skipped).arg(m_queueFile));
+    }
     m_reconnect.setSingleShot(true);
     connect(&m_reconnect, &QTimer::timeout, this, &RouterSource::connectToRouter);
     m_connectTimeout.setSingleShot(true);
@@ -82,11 +98,14 @@ RouterSource::RouterSource(QString host, quint16 port, Connector connector, QLis
 
 RouterSource::~RouterSource()
 {
-    // Quitting with calls still unwritten is the one way to lose them: say which they are.
-    for (const LoggedCall& c : std::as_const(m_queue))
-        say(QStringLiteral("Nicht protokolliert: Anruf %1 vom %2.")
-                .arg(c.number.isEmpty() ? QStringLiteral("ohne Nummer") : c.number,
-                     c.start.toString(QStringLiteral("dd.MM.yyyy hh:mm:ss"))));
+    if (!m_queue.isEmpty() && m_queueSaved && !m_queueFile.isEmpty())
+        say(QStringLiteral("%1 Anrufe warten in \"%2\" auf den nächsten Start.").arg(m_queue.size()).arg(m_queueFile));
+    else
+        // Without the file, quitting is the one way to lose them: say which they are.
+        for (const LoggedCall& c : std::as_const(m_queue))
+            say(QStringLiteral("Nicht protokolliert: Anruf %1 vom %2.")
+                    .arg(c.number.isEmpty() ? QStringLiteral("ohne Nummer") : c.number,
+                         c.start.toString(QStringLiteral("dd.MM.yyyy hh:mm:ss"))));
     m_socket.disconnect(this);
     m_socket.abort();
 }
@@ -131,6 +150,68 @@ bool RouterSource::parseAddress(const QString& text, QString& host, quint16& por
 void RouterSource::start()
 {
     connectToRouter();
+    writeQueued();
+}
+
+QByteArray RouterSource::encodeQueue(const QList<LoggedCall>& calls)
+{
+    QByteArray out;
+    for (const LoggedCall& c : calls) {
+        out += c.start.toString(Qt::ISODate).toLatin1() + '\t' + QByteArray::number(c.direction) + '\t'
+            + (c.answered ? "1" : "0") + '\t' + QByteArray::number(c.durationSeconds) + '\t' + c.number.toLatin1()
+            + '\t' + c.ownNumber.toLatin1() + '\n';
+    }
+    return out;
+}
+
+QList<LoggedCall> RouterSource::decodeQueue(QByteArrayView text, int* skipped)
+{
+    QList<LoggedCall> calls;
+    int bad = 0;
+    for (const QByteArray& line : text.toByteArray().split('\n')) {
+        if (line.trimmed().isEmpty())
+            continue;
+        const QList<QByteArray> f = line.split('\t');
+        LoggedCall c;
+        bool directionOk = false;
+        bool secondsOk = false;
+        if (f.size() == 6) {
+            c.start = QDateTime::fromString(QString::fromLatin1(f[0]), Qt::ISODate);
+            c.direction = f[1].toInt(&directionOk);
+            c.answered = f[2] == "1";
+            c.durationSeconds = f[3].toInt(&secondsOk);
+            c.number = QString::fromLatin1(f[4]);
+            c.ownNumber = QString::fromLatin1(f[5]);
+        }
+        const bool direction = directionOk && (c.direction == LoggedCall::Incoming || c.direction == LoggedCall::Outgoing);
+        if (f.size() != 6 || !c.start.isValid() || !direction || !secondsOk || c.durationSeconds < 0
+            || c.number.size() > kRouterMaxNumberLength || c.ownNumber.size() > kRouterMaxNumberLength) {
+            ++bad;
+            continue;
+        }
+        c.mayBeLogged = true;
+        calls.append(c);
+    }
+    if (skipped)
+        *skipped = bad;
+    return calls;
+}
+
+void RouterSource::saveQueue()
+{
+    if (m_queueFile.isEmpty())
+        return;
+    bool saved = false;
+    if (m_queue.isEmpty()) {
+        saved = !QFileInfo::exists(m_queueFile) || QFile::remove(m_queueFile);
+    } else {
+        QSaveFile file(m_queueFile);
+        saved = file.open(QIODevice::WriteOnly) && file.write(encodeQueue(m_queue)) >= 0 && file.commit();
+    }
+    if (!saved && m_queueSaved)
+        say(QStringLiteral("\"%1\" kann nicht geschrieben werden; die Anrufe warten nur im Speicher.")
+                .arg(m_queueFile));
+    m_queueSaved = saved;
 }
 
 void RouterSource::connectToRouter()
@@ -197,6 +278,7 @@ void RouterSource::enqueue(const RouterCall& call)
         return;
     }
     m_queue.append(loggedCall(call));
+    saveQueue();
 }
 
 void RouterSource::writeQueued()
@@ -219,6 +301,7 @@ void RouterSource::writeQueued()
         switch (writeCall(*m_db, m_queue.constFirst(), m_msns, lid, error)) {
         case WriteResult::Written: {
             const LoggedCall call = m_queue.takeFirst();
+            saveQueue();
             m_dbDelay = m_timing.firstRetryMs;
             say(QStringLiteral("Anruf %1 protokolliert (LID %2).")
                     .arg(call.number.isEmpty() ? QStringLiteral("ohne Nummer") : call.number)

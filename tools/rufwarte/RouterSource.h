@@ -35,9 +35,19 @@ public:
     // Opens the database; throws AppException when it cannot.
     using Connector = std::function<std::unique_ptr<FbAttachment>()>;
 
+    // queueFile: where finished calls wait until the database has them, so that they outlive the
+    // monitor; read back at construction. Empty: they wait in memory only.
     RouterSource(QString host, quint16 port, Connector connector, QList<MsnRecord> msns, Timing timing,
-                 QObject* parent = nullptr);
+                 QString queueFile = {}, QObject* parent = nullptr);
     ~RouterSource() override;
+
+    // The bare name of the queue file in the program folder.
+    static constexpr const char* QueueFileName = "CallQueue";
+
+    // The queue file's text: one line per call. Lines that are no call are passed over and
+    // counted in `skipped`.
+    [[nodiscard]] static QByteArray encodeQueue(const QList<LoggedCall>& calls);
+    [[nodiscard]] static QList<LoggedCall> decodeQueue(QByteArrayView text, int* skipped = nullptr);
 
     // "HOST", "HOST:PORT" or "[IPv6]:PORT"; false for anything else.
     [[nodiscard]] static bool parseAddress(const QString& text, QString& host, quint16& port);
@@ -58,6 +68,7 @@ private:
     void enqueue(const RouterCall& call);
     void writeQueued();
     void retryDatabaseLater();
+    void saveQueue();
 
     QString m_host;
     quint16 m_port;
@@ -75,6 +86,8 @@ private:
 
     std::unique_ptr<FbAttachment> m_db;
     QList<LoggedCall> m_queue;
+    QString m_queueFile;
+    bool m_queueSaved = true;
     QTimer m_writeTimer;
     int m_dbDelay;
 };

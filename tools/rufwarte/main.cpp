@@ -91,7 +91,8 @@ int runMonitor(int autoCalls, const QString& router, int retryMs)
     LoadSwissAereaCodes();
     rufwarte::Monitor monitor;
     QString error;
-    if (!monitor.start(error)) {
+    if (!monitor.start(error, host.isEmpty() ? rufwarte::Monitor::DatabaseAtStart::Required
+                                             : rufwarte::Monitor::DatabaseAtStart::MayFollow)) {
         print(stderr, error);
         return 1;
     }
@@ -104,7 +105,9 @@ int runMonitor(int autoCalls, const QString& router, int retryMs)
             timing.lockRetryMs = std::max(retryMs / 5, 1);
         }
         monitor.watchRouter(new rufwarte::RouterSource(host, port, &rufwarte::connectFromRegistry,
-                                                       rufwarte::programFolderMsns(), timing));
+                                                       rufwarte::programFolderMsns(), timing,
+                                                       programFolder() + QString::fromLatin1(
+                                                           rufwarte::RouterSource::QueueFileName)));
     }
     QObject::connect(&monitor, &rufwarte::Monitor::quitRequested, qApp, &QCoreApplication::quit, Qt::QueuedConnection);
     std::signal(SIGTERM, [](int) { QCoreApplication::quit(); });
