@@ -3,6 +3,7 @@
 // then holds every finished call once, with the texts the program shows, and the program was told
 // of each.
 
+#include "db/FbTransaction.h"
 #include "db/SharedEngine.h"
 #include "platform/MonitorLink.h"
 #include "platform/RufwarteIni.h"
@@ -226,6 +227,45 @@ private Q_SLOTS:
                      .toString(),
                  QStringLiteral("Verbunden|030987654|1"));
         QTRY_VERIFY2(output.contains("2 unlesbare Zeilen"), output.constData());
+    }
+
+    void aKeyHeldByAnotherWriterIsTriedAgain()
+    {
+        QVERIFY2(QFileInfo::exists(rufwarteProgram()), "the rufwarte program is missing from the build");
+        ProgramTestEnv env(QDateTime(QDate(2026, 12, 7), QTime(12, 0)), ProgramTestEnv::ErrorLogSetup::None);
+        // Another writer has taken the next key and not committed yet.
+        env.db().exec(QStringLiteral("ALTER SEQUENCE GEN_LOG_ID RESTART WITH 99"));
+        const std::unique_ptr<FbAttachment> other = env.db().newAttachment();
+        FbTransaction held(*other);
+        held.start();
+        other->executeImmediate(QStringLiteral("INSERT INTO LOG (LID, CTYPE) VALUES (100, 0)"), held);
+
+        QTcpServer router;
+        QVERIFY(router.listen(QHostAddress::LocalHost));
+        QProcess monitor;
+        monitor.setProcessChannelMode(QProcess::MergedChannels);
+        QByteArray output;
+        connect(&monitor, &QProcess::readyRead, this, [&] { output += monitor.readAll(); });
+        const auto cleanup = qScopeGuard([&monitor] {
+            monitor.terminate();
+            if (!monitor.waitForFinished(10000))
+                monitor.kill();
+            monitor.disconnect();
+        });
+        monitor.start(rufwarteProgram(), {QStringLiteral("run"), QStringLiteral("--program-folder"), env.folder(),
+                                          QStringLiteral("--router"),
+                                          QStringLiteral("127.0.0.1:%1").arg(router.serverPort()),
+                                          QStringLiteral("--retry-ms"), QStringLiteral("100")});
+        QVERIFY2(router.waitForNewConnection(15000), output.constData());
+        QTcpSocket* line = router.nextPendingConnection();
+        line->write("07.12.26 09:10:00;RING;1;0891234567;3012345671;SIP1;\n07.12.26 09:10:30;DISCONNECT;1;0;\n");
+        QVERIFY(line->waitForBytesWritten(5000));
+        QTRY_COMPARE_WITH_TIMEOUT(
+            env.db().scalar(QStringLiteral("SELECT COUNT(*) FROM LOG WHERE LID = 101 AND FROMPHONE = '0891234567'")).toInt(),
+            1, 15000);
+        // A conflict is no failure: the attachment was kept and nothing was reported.
+        QVERIFY2(!output.contains("nicht protokolliert"), output.constData());
+        held.rollback();
     }
 
     void aBadRouterAddressIsRefused()

@@ -18,6 +18,7 @@
 #include <QFileInfo>
 #include <QLocalServer>
 #include <QLocalSocket>
+#include <QThread>
 
 #include <cstdio>
 
@@ -198,7 +199,11 @@ WriteResult writeCall(FbAttachment& db, const LoggedCall& call, const QList<MsnR
                 insert.execute();
             } catch (const AppException& e) {
                 const auto* dbError = dynamic_cast<const DatabaseError*>(&e);
-                lockConflict = dbError && dbError->isLockConflict();
+                // A key taken by a writer that has not committed yet shows as a key violation:
+                // the next attempt draws a new key.
+                lockConflict = dbError
+                    && (dbError->isLockConflict() || dbError->hasCode(DatabaseError::PrimaryOrUniqueViolation)
+                        || dbError->hasCode(DatabaseError::UniqueKeyViolation));
                 error = e.message();
                 throw;
             }
@@ -217,11 +222,19 @@ int insertCall(FbAttachment& db, const QString& fromPhone, const QString& onMsn)
     call.number = fromPhone;
     call.ownNumber = onMsn;
     call.start = QDateTime::currentDateTime();
+    const QList<MsnRecord> msns = programFolderMsns();
     int lid = 0;
     QString error;
-    if (writeCall(db, call, programFolderMsns(), lid, error) != WriteResult::Written)
-        throw AppException(error);
-    return lid;
+    // A conflict with another writer passes; a few quick attempts ride it out.
+    for (int attempt = 0; attempt < 5; ++attempt) {
+        const WriteResult result = writeCall(db, call, msns, lid, error);
+        if (result == WriteResult::Written)
+            return lid;
+        if (result == WriteResult::Failed)
+            break;
+        QThread::msleep(50);
+    }
+    throw AppException(error);
 }
 
 Monitor::Monitor()

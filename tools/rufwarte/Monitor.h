@@ -87,7 +87,7 @@ struct LoggedCall {
 
 enum class WriteResult {
     Written,
-    LockConflict, // another writer held the row or generator: worth trying again at once
+    LockConflict, // another writer held a row or took the key: worth trying again at once
     Failed,       // the database refused or is gone: the attachment is not to be trusted
 };
 
