@@ -39,6 +39,23 @@ QString printable(const QByteArray& line)
     return out;
 }
 
+// The usual failures in the monitor's language; the rest as the system words them.
+QString socketErrorText(QAbstractSocket::SocketError error, const QString& systemText)
+{
+    switch (error) {
+    case QAbstractSocket::ConnectionRefusedError:
+        return QStringLiteral("Verbindung abgelehnt; ist der Anrufmonitor des Routers eingeschaltet?");
+    case QAbstractSocket::HostNotFoundError:
+        return QStringLiteral("Router nicht gefunden");
+    case QAbstractSocket::RemoteHostClosedError:
+        return QStringLiteral("Verbindung beendet");
+    case QAbstractSocket::NetworkError:
+        return QStringLiteral("Netzwerkfehler");
+    default:
+        return systemText;
+    }
+}
+
 QString seconds(int ms)
 {
     return QString::number(ms / 1000.0, 'f', ms % 1000 == 0 ? 0 : 1);
@@ -92,7 +109,7 @@ RouterSource::RouterSource(QString host, quint16 port, Connector connector, QLis
     connect(&m_socket, &QTcpSocket::errorOccurred, this, [this](QAbstractSocket::SocketError error) {
         // A closed connection also reports RemoteHostClosedError; "disconnected" handles it.
         if (error != QAbstractSocket::RemoteHostClosedError || m_socket.state() == QAbstractSocket::UnconnectedState)
-            lineDropped(m_socket.errorString());
+            lineDropped(socketErrorText(error, m_socket.errorString()));
     });
 }
 
