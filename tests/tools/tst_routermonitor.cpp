@@ -115,6 +115,7 @@ private Q_SLOTS:
         line->write("08;CONNECT;2;1;030987654;\r\n"
                     "07.12.26 09:21:08;DISCONNECT;2;60;\r\n"
                     "07.12.26 09:30:00;RING;3;;3012345670;SIP0;\r\n"
+                    + QByteArray(1 << 20, 'x') + "\r\n"
                     "07.12.26 09:30:15;DISCONNECT;3;0;\r\n"
                     // A call in progress when the line drops.
                     "07.12.26 09:40:00;RING;4;01701234567;3012345670;SIP0;\r\n"
@@ -163,6 +164,7 @@ private Q_SLOTS:
         const QString out = QString::fromLocal8Bit(output);
         QVERIFY2(out.contains(QStringLiteral("welcome to the router")), qPrintable(out));
         QVERIFY2(out.contains(QStringLiteral("DISCONNECT ohne RING")), qPrintable(out));
+        QVERIFY2(out.contains(QStringLiteral("Überlange Zeile")), qPrintable(out));
     }
 
     void callsWaitForTheDatabaseAndOutliveTheMonitor()

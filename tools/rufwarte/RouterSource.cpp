@@ -11,6 +11,12 @@
 
 #include <algorithm>
 
+#ifdef Q_OS_LINUX
+#include <netinet/in.h>
+#include <netinet/tcp.h>
+#include <sys/socket.h>
+#endif
+
 namespace orvanta::rufwarte {
 
 namespace {
@@ -37,6 +43,22 @@ QString printable(const QByteArray& line)
     for (const char c : line.left(80))
         out += c >= 0x20 && c < 0x7f ? QLatin1Char(c) : QLatin1Char('?');
     return out;
+}
+
+// The router says nothing between calls, so a router switched off would leave the connection
+// open for good: keep-alive probes after a minute of silence find out within two.
+void keepAlive(QTcpSocket& socket)
+{
+    socket.setSocketOption(QAbstractSocket::KeepAliveOption, 1);
+#ifdef Q_OS_LINUX
+    const int fd = static_cast<int>(socket.socketDescriptor());
+    const int idle = 60;
+    const int interval = 10;
+    const int count = 6;
+    ::setsockopt(fd, IPPROTO_TCP, TCP_KEEPIDLE, &idle, sizeof idle);
+    ::setsockopt(fd, IPPROTO_TCP, TCP_KEEPINTVL, &interval, sizeof interval);
+    ::setsockopt(fd, IPPROTO_TCP, TCP_KEEPCNT, &count, sizeof count);
+#endif
 }
 
 // The usual failures in the monitor's language; the rest as the system words them.
@@ -95,8 +117,11 @@ RouterSource::RouterSource(QString host, quint16 port, Connector connector, QLis
     m_writeTimer.setSingleShot(true);
     connect(&m_writeTimer, &QTimer::timeout, this, &RouterSource::writeQueued);
 
+    // Reading happens on every readyRead; a bounded buffer keeps a flooding router in the kernel.
+    m_socket.setReadBufferSize(64 * 1024);
     connect(&m_socket, &QTcpSocket::connected, this, [this] {
         m_connectTimeout.stop();
+        keepAlive(m_socket);
         say(QStringLiteral("Verbunden mit dem Anrufmonitor des Routers %1:%2.").arg(m_host).arg(m_port));
     });
     connect(&m_socket, &QTcpSocket::readyRead, this, &RouterSource::readLines);
