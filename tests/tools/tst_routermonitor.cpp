@@ -206,28 +206,31 @@ private Q_SLOTS:
         QTRY_COMPARE_WITH_TIMEOUT(queued(), qsizetype(2), 15000);
         QVERIFY2(output.contains("Keine Verbindung zur Datenbank"), output.constData());
 
-        // The monitor dies without a word; the first call had reached the log before it did.
+        // The monitor dies without a word. Say it had written the first call and marked it done,
+        // and had written the second without getting as far as the mark; a third call was queued.
         monitor.kill();
         QVERIFY(monitor.waitForFinished(10000));
         QVERIFY(QFile::rename(away, env.db().path()));
         env.db().exec(QStringLiteral(
             "INSERT INTO LOG (LID, FROMPHONE, ONMSN, CTYPE, CTIME, TS, TSDATE, TSTIME) VALUES "
-            "(1, '0891234567', '3012345671', 0, '00:00:00', '2026-12-07 09:10:00', '2026-12-07', '09:10:00')"));
-        QFile junk(queueFile);
-        QVERIFY(junk.open(QIODevice::Append));
-        junk.write("not a call\n2026-12-07T09:00:00\t7\t0\t0\t030\t301\n");
-        junk.close();
+            "(1, '030987654', '3012345670', 1, '00:01:00', '2026-12-07 09:20:00', '2026-12-07', '09:20:00')"));
+        QFile more(queueFile);
+        QVERIFY(more.open(QIODevice::Append));
+        more.write("-\nnot a call\n2026-12-07T09:00:00\t7\t0\t0\t030\t301\n"
+                   "2026-12-07T09:30:00\t0\t1\t42\t0301111\t3012345670\n");
+        more.close();
 
-        // The next start writes what waited, once, and says what it passed over.
+        // The next start writes what still waited, once, and says what it passed over.
         output.clear();
         monitor.start(rufwarteProgram(), args);
         QTRY_VERIFY_WITH_TIMEOUT(!QFileInfo::exists(queueFile), 15000);
         QCOMPARE(env.db().scalar(QStringLiteral("SELECT COUNT(*) FROM LOG")).toInt(), 2);
+        QCOMPARE(env.db().scalar(QStringLiteral("SELECT COUNT(*) FROM LOG WHERE FROMPHONE = '0891234567'")).toInt(), 0);
         QCOMPARE(env.db()
-                     .scalar(QStringLiteral("SELECT STATUS || '|' || FROMBEZ || '|' || CTYPE FROM LOG "
-                                            "WHERE FROMPHONE = '030987654' AND CTIME = '00:01:00'"))
+                     .scalar(QStringLiteral("SELECT STATUS || '|' || FROMBEZ || '|' || CTYPE || '|' || TSTIME FROM LOG "
+                                            "WHERE FROMPHONE = '0301111' AND CTIME = '00:00:42'"))
                      .toString(),
-                 QStringLiteral("Verbunden|030987654|1"));
+                 QStringLiteral("Verbunden|0301111|0|09:30:00.0000"));
         QTRY_VERIFY2(output.contains("2 unlesbare Zeilen"), output.constData());
     }
 

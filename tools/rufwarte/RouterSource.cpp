@@ -101,10 +101,13 @@ RouterSource::RouterSource(QString host, quint16 port, Connector connector, QLis
     if (!m_queueFile.isEmpty() && file.open(QIODevice::ReadOnly)) {
         int skipped = 0;
         m_queue = decodeQueue(file.read(QueueFileLimit), &skipped);
+        file.close();
         if (!m_queue.isEmpty())
             say(QStringLiteral("%1 Anrufe aus \"%2\" warten auf die Datenbank.").arg(m_queue.size()).arg(m_queueFile));
         if (skipped > 0)
             say(QStringLiteral("%1 unlesbare Zeilen in \"%2\" übergangen.").arg(skipped).arg(m_queueFile));
+        // Written anew, so that what is appended from now on follows whole lines.
+        rewriteQueueFile();
     }
     m_reconnect.setSingleShot(true);
     connect(&m_reconnect, &QTimer::timeout, this, &RouterSource::connectToRouter);
@@ -213,6 +216,14 @@ QList<LoggedCall> RouterSource::decodeQueue(QByteArrayView text, int* skipped)
     for (const QByteArray& line : text.toByteArray().split('\n')) {
         if (line.trimmed().isEmpty())
             continue;
+        if (line == "-") {
+            // The oldest call was written.
+            if (calls.isEmpty())
+                ++bad;
+            else
+                calls.removeFirst();
+            continue;
+        }
         const QList<QByteArray> f = line.split('\t');
         LoggedCall c;
         bool directionOk = false;
@@ -239,10 +250,9 @@ QList<LoggedCall> RouterSource::decodeQueue(QByteArrayView text, int* skipped)
     return calls;
 }
 
-void RouterSource::saveQueue()
+void RouterSource::rewriteQueueFile()
 {
-    if (m_queueFile.isEmpty())
-        return;
+    m_journal.close();
     bool saved = false;
     if (m_queue.isEmpty()) {
         saved = !QFileInfo::exists(m_queueFile) || QFile::remove(m_queueFile);
@@ -250,6 +260,27 @@ void RouterSource::saveQueue()
         QSaveFile file(m_queueFile);
         saved = file.open(QIODevice::WriteOnly) && file.write(encodeQueue(m_queue)) >= 0 && file.commit();
     }
+    queueFileWritten(saved);
+}
+
+void RouterSource::appendToQueueFile(const QByteArray& lines)
+{
+    if (m_queueFile.isEmpty())
+        return;
+    // Appended and handed to the system without a sync: that outlives the monitor's end, and
+    // costs far less than the database's own commit.
+    if (!m_journal.isOpen()) {
+        m_journal.setFileName(m_queueFile);
+        if (!m_journal.open(QIODevice::WriteOnly | QIODevice::Append)) {
+            queueFileWritten(false);
+            return;
+        }
+    }
+    queueFileWritten(m_journal.write(lines) == lines.size() && m_journal.flush());
+}
+
+void RouterSource::queueFileWritten(bool saved)
+{
     if (!saved && m_queueSaved)
         say(QStringLiteral("\"%1\" kann nicht geschrieben werden; die Anrufe warten nur im Speicher.")
                 .arg(m_queueFile));
@@ -320,7 +351,7 @@ void RouterSource::enqueue(const RouterCall& call)
         return;
     }
     m_queue.append(loggedCall(call));
-    saveQueue();
+    appendToQueueFile(encodeQueue({m_queue.constLast()}));
 }
 
 void RouterSource::writeQueued()
@@ -343,7 +374,10 @@ void RouterSource::writeQueued()
         switch (writeCall(*m_db, m_queue.constFirst(), m_msns, lid, error)) {
         case WriteResult::Written: {
             const LoggedCall call = m_queue.takeFirst();
-            saveQueue();
+            if (m_queue.isEmpty())
+                rewriteQueueFile(); // i.e. removed
+            else
+                appendToQueueFile(QByteArrayLiteral("-\n"));
             m_dbDelay = m_timing.firstRetryMs;
             say(QStringLiteral("Anruf %1 protokolliert (LID %2).")
                     .arg(call.number.isEmpty() ? QStringLiteral("ohne Nummer") : call.number)

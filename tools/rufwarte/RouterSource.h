@@ -7,6 +7,7 @@
 #include "phone/RouterCallMonitor.h"
 #include "tools/rufwarte/Monitor.h"
 
+#include <QFile>
 #include <QObject>
 #include <QTcpSocket>
 #include <QTimer>
@@ -44,8 +45,8 @@ public:
     // The bare name of the queue file in the program folder.
     static constexpr const char* QueueFileName = "CallQueue";
 
-    // The queue file's text: one line per call. Lines that are no call are passed over and
-    // counted in `skipped`.
+    // The queue file's text: one line per call, and a line "-" each time the oldest call was
+    // written. Lines that are neither are passed over and counted in `skipped`.
     [[nodiscard]] static QByteArray encodeQueue(const QList<LoggedCall>& calls);
     [[nodiscard]] static QList<LoggedCall> decodeQueue(QByteArrayView text, int* skipped = nullptr);
 
@@ -68,7 +69,9 @@ private:
     void enqueue(const RouterCall& call);
     void writeQueued();
     void retryDatabaseLater();
-    void saveQueue();
+    void rewriteQueueFile();
+    void appendToQueueFile(const QByteArray& lines);
+    void queueFileWritten(bool saved);
 
     QString m_host;
     quint16 m_port;
@@ -87,6 +90,7 @@ private:
     std::unique_ptr<FbAttachment> m_db;
     QList<LoggedCall> m_queue;
     QString m_queueFile;
+    QFile m_journal; // the queue file while calls are appended to it
     bool m_queueSaved = true;
     QTimer m_writeTimer;
     int m_dbDelay;
