@@ -4,6 +4,7 @@
 #include "platform/AppException.h"
 #include "platform/MonitorLink.h"
 
+#include <QElapsedTimer>
 #include <QFile>
 #include <QFileInfo>
 #include <QSaveFile>
@@ -359,7 +360,15 @@ void RouterSource::writeQueued()
     // A retry is pending: its timer writes the queue, in order.
     if (m_writeTimer.isActive())
         return;
+    QElapsedTimer busy;
+    busy.start();
     while (!m_queue.isEmpty()) {
+        // A long queue is written in slices, so that the router's lines and the messages to the
+        // monitor (quit, pause) are not kept waiting.
+        if (busy.hasExpired(100)) {
+            m_writeTimer.start(0);
+            return;
+        }
         if (!m_db) {
             try {
                 m_db = m_connector();
@@ -395,6 +404,8 @@ void RouterSource::writeQueued()
                     .arg(error));
             // A server that went away leaves a dead attachment: the next attempt opens a new one.
             m_db.reset();
+            // The commit may have gone through with only its answer lost.
+            m_queue.first().mayBeLogged = true;
             retryDatabaseLater();
             return;
         }
