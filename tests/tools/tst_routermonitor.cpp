@@ -137,12 +137,12 @@ private Q_SLOTS:
         const QStringList expected{
             QString::fromUtf8("01701234567|Erika Mustermann|3012345670|Büro|Verbunden|0|00:03:00||7|Mobil|"
                               "2026-12-07 09:00:00"),
-            QString::fromUtf8("0891234567|0891234567|3012345671|Privat|Anruf in Abwesenheit|0|00:00:00|München|0||"
+            QString::fromUtf8("0891234567|0891234567|3012345671|Privat|Nicht angenommen|0|00:00:00|München|0||"
                               "2026-12-07 09:10:00"),
             QString::fromUtf8("030987654|030987654|3012345670|Büro|Verbunden|1|00:01:00|Berlin|0||"
                               "2026-12-07 09:20:00"),
             withheld + QString::fromUtf8("|") + withheld
-                + QString::fromUtf8("|3012345670|Büro|Anruf in Abwesenheit|0|00:00:00||0||2026-12-07 09:30:00"),
+                + QString::fromUtf8("|3012345670|Büro|Nicht angenommen|0|00:00:00||0||2026-12-07 09:30:00"),
             QString::fromUtf8("01701234567|Erika Mustermann|3012345670|Büro|Verbunden|0|00:05:00||7|Mobil|"
                               "2026-12-07 09:40:00"),
             QString::fromUtf8("+43151234|+43151234|3012345671|Privat|Keine Antwort|1|00:00:00|Wien|0||"

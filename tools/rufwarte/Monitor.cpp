@@ -110,7 +110,7 @@ QString statusText(const LoggedCall& call)
     if (call.answered)
         return QStringLiteral("Verbunden");
     return call.direction == LoggedCall::Outgoing ? QStringLiteral("Keine Antwort")
-                                                  : QStringLiteral("Anruf in Abwesenheit");
+                                                  : QStringLiteral("Nicht angenommen");
 }
 
 } // namespace
