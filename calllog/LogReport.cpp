@@ -1,8 +1,6 @@
 #include "calllog/LogReport.h"
 
-#include "db/DatabaseError.h"
 #include "db/FbStatement.h"
-#include "db/FbTransaction.h"
 #include "ui/report/ReportRun.h"
 
 #include <QLocale>
@@ -33,9 +31,39 @@ bool detailed(int variant)
     return variant % 2 == 1;
 }
 
+// Digits written by hand: a long report formats two of these per row, and QDate's and QTime's
+// format strings are parsed on every call.
+void putDigits(QChar*& to, int value, int count)
+{
+    for (int i = count - 1; i >= 0; --i, value /= 10)
+        to[i] = QChar(u'0' + value % 10);
+    to += count;
+}
+
 QString shortDate(QDate date)
 {
-    return date.toString(QStringLiteral("dd.MM.yyyy"));
+    if (!date.isValid() || date.year() < 1 || date.year() > 9999)
+        return date.toString(QStringLiteral("dd.MM.yyyy"));
+    QString text(10, Qt::Uninitialized);
+    QChar* to = text.data();
+    putDigits(to, date.day(), 2);
+    *to++ = u'.';
+    putDigits(to, date.month(), 2);
+    *to++ = u'.';
+    putDigits(to, date.year(), 4);
+    return text;
+}
+
+QString shortTime(QTime time)
+{
+    if (!time.isValid())
+        return time.toString(QStringLiteral("hh:mm"));
+    QString text(5, Qt::Uninitialized);
+    QChar* to = text.data();
+    putDigits(to, time.hour(), 2);
+    *to++ = u':';
+    putDigits(to, time.minute(), 2);
+    return text;
 }
 
 } // namespace
@@ -68,18 +96,13 @@ LogReportQuery logReportQuery(int variant, QDate start, QDate end)
 }
 
 LogReportConnection::LogReportConnection(FbStatement& statement, LogReportQuery query, int variant)
-    : m_statement(statement)
-    , m_query(std::move(query))
+    : StatementReportSource(statement, std::move(query.sql), std::move(query.params))
     , m_variant(variant)
 {
 }
 
 QList<ReportField> LogReportConnection::fields() const
 {
-    auto field = [](const char* name, int width) {
-        const QString n = QLatin1String(name);
-        return ReportField{n, width, QStringLiteral("Feld ") + n};
-    };
     QList<ReportField> list{field("Datum", 16),  field("Zeit", 11),   field("Verbindung", 11),
                             field("Anrufer", 81), field("Status", 41), field("Angerufener", 81)};
     if (detailed(m_variant))
@@ -87,27 +110,6 @@ QList<ReportField> LogReportConnection::fields() const
                  field("Region", 36)};
     list.append(field("Odd", 1));
     return list;
-}
-
-void LogReportConnection::open()
-{
-    m_statement.close();
-    FbTransaction* transaction = m_statement.transaction();
-    if (transaction->isActive())
-        transaction->commit();
-    m_statement.setSql(m_query.sql);
-    m_counter = 0;
-    if (!transaction->isActive())
-        transaction->start();
-    for (const auto& [name, value] : std::as_const(m_query.params))
-        m_statement.setParam(name, value);
-    m_statement.execute();
-    m_hasRow = m_statement.next();
-}
-
-bool LogReportConnection::atEnd() const
-{
-    return !m_hasRow;
 }
 
 QString LogReportConnection::durationText(qint64 seconds)
@@ -119,10 +121,10 @@ QString LogReportConnection::durationText(qint64 seconds)
 
 QStringList LogReportConnection::row() const
 {
-    const FbStatement& s = m_statement;
+    const FbStatement& s = statement();
     QStringList values;
     values << (s.isNull(0) ? QString() : shortDate(s.asDate(0)));
-    values << (s.isNull(1) ? QString() : s.asTime(1).toString(QStringLiteral("hh:mm")));
+    values << (s.isNull(1) ? QString() : shortTime(s.asTime(1)));
     values << (s.asInt(2) != 0 ? QStringLiteral("abgehend") : QStringLiteral("ankommend"));
     values << s.asString(3) << s.asString(4) << s.asString(5);
     if (detailed(m_variant)) {
@@ -134,59 +136,27 @@ QStringList LogReportConnection::row() const
         const QString region = s.asString(10);
         values << (m_variant == 7 && !region.isEmpty() ? QStringLiteral(" (") + region + QLatin1Char(')') : region);
     }
-    values << (m_counter % 2 == 0 ? QStringLiteral("T") : QStringLiteral("F"));
+    values << odd();
     return values;
-}
-
-void LogReportConnection::next()
-{
-    ++m_counter;
-    m_hasRow = m_statement.next();
-}
-
-void LogReportConnection::restore()
-{
-    FbTransaction* transaction = m_statement.transaction();
-    if (transaction && transaction->isActive())
-        transaction->commit();
-    m_statement.close();
 }
 
 bool LogPrint(FbStatement* statement, int variant, ReportOutcome& outcome, QDate end, QDate start)
 {
     outcome = ReportOutcome{};
-    if (!statement) {
-        outcome.code = int(ReportResult::NO_QUERY_AVAILABLE);
+    if (reportStatementMissing(statement, outcome))
         return false;
-    }
-    if (!statement->transaction()) {
-        outcome.code = int(ReportResult::NO_TRANSACTION_AVAILABLE);
-        return false;
-    }
     const LogReportVariant* v = logReportVariant(variant);
     if (!v) {
         outcome.code = int(ReportResult::NO_REPORT_ASSIGNED);
         return false;
     }
-    try {
+    return runStatementReport(*statement, outcome, [&] {
         LogReportQuery query = logReportQuery(variant, start, end);
         ReportParameters parameters;
         parameters.text.insert(QStringLiteral("Zeitraum"), query.zeitraum);
         LogReportConnection connection(*statement, std::move(query), variant);
         runReport(QLatin1String(v->report), std::move(parameters), &connection, QStringLiteral("Vorschau Anrufprotokoll"));
-    } catch (const DatabaseError& e) {
-        outcome.code = int(ReportResult::UNEXPECTED);
-        outcome.number = e.ibErrorCode();
-        outcome.message = e.message();
-        statement->close();
-        statement->transaction()->rollbackQuietly();
-        return false;
-    } catch (const std::exception& e) {
-        outcome.code = int(ReportResult::UNEXPECTED);
-        outcome.message = QString::fromUtf8(e.what());
-        return false;
-    }
-    return true;
+    });
 }
 
 } // namespace orvanta

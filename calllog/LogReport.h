@@ -2,7 +2,7 @@
 // The call log's reports: ten variants (simple or detailed, five groupings) over the log of all
 // days, one day or a period, read through a statement of the data module into the report engine.
 
-#include "ui/report/ReportDataSource.h"
+#include "dbgrid/StatementReportSource.h"
 #include "ui/report/ReportResult.h"
 
 #include <QDate>
@@ -30,26 +30,18 @@ struct LogReportQuery {
 [[nodiscard]] LogReportQuery logReportQuery(int variant, QDate start, QDate end);
 
 // The rows of one call-log report, formatted for printing.
-class LogReportConnection final : public ReportDataSource {
+class LogReportConnection final : public StatementReportSource {
 public:
     LogReportConnection(FbStatement& statement, LogReportQuery query, int variant);
 
     [[nodiscard]] QList<ReportField> fields() const override;
-    void open() override;
-    [[nodiscard]] bool atEnd() const override;
     [[nodiscard]] QStringList row() const override;
-    void next() override;
-    void restore() override;
 
     // "26:03:04" for 1 day 2 h 3 min 4 s; no leading zeros on the hours.
     [[nodiscard]] static QString durationText(qint64 seconds);
 
 private:
-    FbStatement& m_statement;
-    LogReportQuery m_query;
     int m_variant;
-    qint64 m_counter = 0; // behind `Odd`: restarts with every open
-    bool m_hasRow = false;
 };
 
 // Prints one call-log report into the preview. False with the outcome filled when it failed;

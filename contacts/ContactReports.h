@@ -2,7 +2,7 @@
 // The address book's prints: the contact overview (one row per contact and category) and the
 // note of one contact.
 
-#include "ui/report/ReportDataSource.h"
+#include "dbgrid/StatementReportSource.h"
 #include "ui/report/ReportResult.h"
 
 #include <QByteArray>
@@ -11,21 +11,12 @@ namespace orvanta {
 
 class FbStatement;
 
-class ContactOverviewConnection final : public ReportDataSource {
+class ContactOverviewConnection final : public StatementReportSource {
 public:
     explicit ContactOverviewConnection(FbStatement& statement);
 
     [[nodiscard]] QList<ReportField> fields() const override;
-    void open() override;
-    [[nodiscard]] bool atEnd() const override;
     [[nodiscard]] QStringList row() const override;
-    void next() override;
-    void restore() override;
-
-private:
-    FbStatement& m_statement;
-    qint64 m_counter = 0;
-    bool m_hasRow = false;
 };
 
 // Each shows its report in the preview; false with the outcome filled when it failed.

@@ -1,5 +1,6 @@
 #include "calllog/LogReport.h"
 #include "calllog/TLogPrintSelection.h"
+#include "db/FbStatement.h"
 #include "tests/TestPaths.h"
 #include "tests/calllog/LogTestEnv.h"
 #include "tests/support/ReportCapture.h"
@@ -181,6 +182,37 @@ private Q_SLOTS:
         QVERIFY(outcome.message.contains(QStringLiteral("Zeile 4: unbekanntes Feld oder unbekannter Parameter „Telefon“")));
         QCOMPARE(capture.count(), 0);
         QVERIFY(!env.dm().rave_ibsql_ts.isActive());
+    }
+
+    // The database failing while the rows are read: the outcome carries its number and text, the
+    // read is rolled back, and the same statement prints the next report.
+    void aDatabaseFailureIsReportedAndLeavesTheStatementUsable()
+    {
+        LogTestEnv env;
+        installReports(env);
+        fillLog(env);
+        ReportCapture capture;
+        FbStatement& statement = env.dm().rave_ibsql;
+        class Dividing final : public StatementReportSource {
+        public:
+            using StatementReportSource::StatementReportSource;
+            QList<ReportField> fields() const override { return {field("Wert", 10)}; }
+            QStringList row() const override { return {statement().asString(0)}; }
+        };
+        ReportOutcome outcome;
+        QVERIFY(!runStatementReport(statement, outcome, [&statement] {
+            Dividing source(statement, QStringLiteral("select 1 / (LID - 3) from LOG order by LID desc"));
+            for (source.open(); !source.atEnd(); source.next())
+                (void)source.row();
+        }));
+        QCOMPARE(reportResultName(outcome.code), QStringLiteral("UNEXPECTED"));
+        QVERIFY(outcome.number != 0);
+        QVERIFY2(!outcome.message.isEmpty(), qPrintable(outcome.message));
+        QVERIFY(!env.dm().rave_ibsql_ts.isActive());
+
+        QVERIFY2(LogPrint(&statement, 0, outcome, QDate(), QDate()), qPrintable(outcome.message));
+        QCOMPARE(capture.count(), 1);
+        QVERIFY(capture.text().contains(QStringLiteral("Özdemir")));
     }
 
     void printSelectionChoosesTheVariantAndPeriod()

@@ -181,6 +181,33 @@ private Q_SLOTS:
         QVERIFY(!text.contains(QStringLiteral("Ort: ")));
     }
 
+    // A template is compiled once and expanded per cell; both ways give the same text.
+    void templatesExpandFieldsParametersPagesAndBraces()
+    {
+        MemorySource source({QStringLiteral("Name"), QStringLiteral("Ort"), QStringLiteral("Odd")}, townRows(3));
+        ReportLayout layout(definition("Liste"), zeitraum(), &source, kPrinted);
+        layout.layoutAll();
+        const QList<std::pair<const char*, const char*>> cases{
+            {"{Name}", "Person 001"},
+            {"{Ort}", "Köln"},
+            {"{{{Name}}} {Zeitraum}", "{Person 001} (alles)"},
+            {"{{Seite}} Seite {Seite} von { Seiten }", "{Seite} Seite 2 von 1"},
+            {"{Druckdatum}, {Druckzeit} Uhr", "09.03.2026, 14:05 Uhr"},
+            {"ohne Namen", "ohne Namen"},
+            {"", ""},
+        };
+        for (const auto& [templ, expected] : cases) {
+            const QString t = QString::fromUtf8(templ);
+            QString scratch = QStringLiteral("vorher");
+            const QStringView compiled = layout.expand(layout.compile(t), 1, 1, scratch);
+            QCOMPARE(compiled.toString(), QString::fromUtf8(expected));
+            QCOMPARE(layout.expand(t, 1, 1), QString::fromUtf8(expected));
+        }
+        // A row beyond the report has empty fields, not stale ones.
+        QString scratch;
+        QVERIFY(layout.expand(layout.compile(QStringLiteral("{Name}")), 99, 0, scratch).isEmpty());
+    }
+
     void oddValuesPrintAsTheyAre()
     {
         // A separator character inside a value, characters the report font lacks, an empty row.

@@ -1,4 +1,6 @@
+#include "platform/ErrorLog.h"
 #include "tests/support/ReportCapture.h"
+#include "tests/support/ScriptedDialogService.h"
 #include "tests/support/TestRegistry.h"
 #include "ui/report/ReportLayout.h"
 #include "ui/report/ReportParser.h"
@@ -9,6 +11,7 @@
 #include <QLabel>
 #include <QLineEdit>
 #include <QPdfWriter>
+#include <QPrinter>
 #include <QPushButton>
 #include <QRadioButton>
 #include <QScrollArea>
@@ -82,6 +85,33 @@ public:
 
 private:
     QTemporaryDir m_dir;
+};
+
+// A printer that takes `pages` pages and then goes away: the next page is refused, as a printer
+// device reports a job it cannot go on with.
+class VanishingPrinter final : public QPdfWriter {
+public:
+    VanishingPrinter(const QString& path, int pages)
+        : QPdfWriter(path)
+        , m_pages(pages)
+    {
+    }
+    bool newPage() override { return ++m_done < m_pages && QPdfWriter::newPage(); }
+
+private:
+    int m_pages;
+    int m_done = 0;
+};
+
+// What the user is shown: the error log's dialogs, scripted.
+struct ShownErrors {
+    QTemporaryDir dir;
+    ScopedScriptedDialogs dialogs;
+    TvkErrorLog log{dir.path(), 20, QStringLiteral("OXError.log")};
+    ShownErrors() { setErrorLog(&log); }
+    ~ShownErrors() { setErrorLog(nullptr); }
+    ShownErrors(const ShownErrors&) = delete;
+    ShownErrors& operator=(const ShownErrors&) = delete;
 };
 
 } // namespace
@@ -242,6 +272,67 @@ private Q_SLOTS:
         dialog->AdvTB1Click();
         QCOMPARE(printer.jobs, jobs);
         QTRY_VERIFY(!w.printDialog());
+    }
+
+    // Every way a printer can fail during a job ends in one message, the dialog closed and the
+    // preview still usable: the next job prints as if nothing had happened.
+    void aPrinterThatGoesAwayIsReported()
+    {
+        ShownErrors errors;
+        QTemporaryDir dir;
+        const QString path = dir.filePath(QStringLiteral("druck.pdf"));
+        std::function<std::unique_ptr<QPagedPaintDevice>()> device;
+        bool installed = true;
+        setPrintTarget({[&installed] { return installed; }, [&device] { return device(); }});
+        Rows rows(300);
+        ReportLayout layout(listReport(), {}, &rows, QDateTime::currentDateTime());
+        layout.start();
+        TRavePreviewF w(layout, QStringLiteral("Vorschau"));
+        w.show();
+        auto print = [&w](auto&& makeDevice, std::function<std::unique_ptr<QPagedPaintDevice>()>& slot) {
+            slot = makeDevice;
+            action(w, "rv_Print")->trigger();
+            QVERIFY(w.printDialog());
+            QTest::mouseClick(w.printDialog()->findChild<QPushButton*>(QStringLiteral("AdvTB1")), Qt::LeftButton);
+            QTRY_VERIFY(!w.printDialog());
+        };
+        auto lastError = [&errors] { return errors.dialogs->count() ? errors.dialogs->last().text : QString(); };
+
+        // Gone after the second page.
+        print([&path] { return std::make_unique<VanishingPrinter>(path, 2); }, device);
+        QCOMPARE(errors.dialogs->count(), 1);
+        QVERIFY2(lastError().contains(QStringLiteral("Der Bericht konnte nicht gedruckt werden.")), qPrintable(lastError()));
+        QVERIFY2(lastError().contains(QStringLiteral("Seite 3")), qPrintable(lastError()));
+        QCOMPARE(pdfPages(path), 2); // what reached the printer is a whole document
+
+        // Gone before the job starts: the system no longer names a printer, and "Drucken" goes
+        // off until one is back.
+        installed = false;
+        print([] { return std::unique_ptr<QPagedPaintDevice>(); }, device);
+        QCOMPARE(errors.dialogs->count(), 2);
+        QVERIFY2(lastError().contains(QStringLiteral("kein Drucker")), qPrintable(lastError()));
+        QVERIFY(!action(w, "rv_Print")->isEnabled());
+        installed = true;
+        w.updatePrintAction();
+
+        // A printer that refuses the job outright.
+        print(
+            [&dir] {
+                auto printer = std::make_unique<QPrinter>(QPrinter::HighResolution);
+                printer->setOutputFormat(QPrinter::PdfFormat);
+                printer->setOutputFileName(dir.filePath(QStringLiteral("fehlt/druck.pdf")));
+                return printer;
+            },
+            device);
+        QCOMPARE(errors.dialogs->count(), 3);
+        QVERIFY2(lastError().contains(QStringLiteral("nimmt den Bericht nicht an")), qPrintable(lastError()));
+
+        // Back again: the whole report.
+        print([&path] { return std::make_unique<QPdfWriter>(path); }, device);
+        QCOMPARE(errors.dialogs->count(), 3);
+        QCOMPARE(pdfPages(path), layout.pageCount());
+        QVERIFY(w.isVisible());
+        setPrintTarget({});
     }
 
     void pdfSavesTheWholeReport()

@@ -135,6 +135,9 @@ void ReportLayout::start()
     }
     for (Level& level : m_levels)
         level.field = m_fieldIndex.value(level.header->groupBy, -1);
+    m_shadeField.clear();
+    for (const ReportBand& band : std::as_const(m_definition.bands))
+        m_shadeField.append(band.shadeField.isEmpty() ? -1 : m_fieldIndex.value(band.shadeField, -1));
     checkNames();
     for (const ReportBand& band : std::as_const(m_definition.bands)) {
         for (const ReportItem& item : band.items) {
@@ -163,39 +166,81 @@ QTextDocument* ReportLayout::richDocument(const ReportItem* item) const
 
 bool ReportLayout::isShaded(const ReportBand& band, int row) const
 {
-    if (band.shadeField.isEmpty() || row < 0 || row >= m_rows.size())
+    const qsizetype index = &band - m_definition.bands.constData();
+    if (index < 0 || index >= m_shadeField.size() || row < 0 || row >= m_rows.size())
         return false;
-    const int field = m_fieldIndex.value(band.shadeField, -1);
+    const int field = m_shadeField[index];
     return field >= 0 && value(row, field) == u"T";
 }
 
-QString ReportLayout::expand(const QString& templ, int row, int pageIndex) const
+ReportLayout::Template ReportLayout::compile(const QString& templ) const
 {
-    QString out;
+    Template parts;
     qsizetype copied = 0;
     auto literal = [&](qsizetype to) {
         // "{{" and "}}" outside placeholders are single braces.
         QString part = templ.mid(copied, to - copied);
         part.replace(QLatin1String("{{"), QLatin1String("{")).replace(QLatin1String("}}"), QLatin1String("}"));
-        out += part;
+        if (!part.isEmpty())
+            parts.append(TemplatePart{TemplatePart::Kind::Literal, part, -1});
     };
     forEachName(templ, [&](qsizetype open, qsizetype close, const QString& name) {
         literal(open);
         copied = close + 1;
+        using Kind = TemplatePart::Kind;
         if (const auto field = m_fieldIndex.constFind(name); field != m_fieldIndex.cend())
-            out += value(row, *field);
+            parts.append(TemplatePart{Kind::Field, {}, *field});
         else if (const auto param = m_parameters.text.constFind(name); param != m_parameters.text.cend())
-            out += *param;
+            parts.append(TemplatePart{Kind::Parameter, *param, -1});
         else if (name == kPage)
-            out += QString::number(pageIndex + 1);
+            parts.append(TemplatePart{Kind::Page, {}, -1});
         else if (name == kPages)
-            out += QString::number(pageCount());
+            parts.append(TemplatePart{Kind::Pages, {}, -1});
         else if (name == kDate)
-            out += m_printedAt.date().toString(QStringLiteral("dd.MM.yyyy"));
+            parts.append(TemplatePart{Kind::Date, {}, -1});
         else if (name == kTime)
-            out += m_printedAt.time().toString(QStringLiteral("hh:mm"));
+            parts.append(TemplatePart{Kind::Time, {}, -1});
     });
     literal(templ.size());
+    return parts;
+}
+
+QString ReportLayout::expand(const QString& templ, int row, int pageIndex) const
+{
+    QString out;
+    const QStringView text = expand(compile(templ), row, pageIndex, out);
+    return text.data() == out.constData() ? out : text.toString();
+}
+
+QStringView ReportLayout::expand(const Template& templ, int row, int pageIndex, QString& out) const
+{
+    using Kind = TemplatePart::Kind;
+    if (templ.size() == 1 && templ.front().kind == Kind::Field)
+        return value(row, templ.front().field);
+    out.clear();
+    for (const TemplatePart& part : templ) {
+        switch (part.kind) {
+        case Kind::Literal:
+        case Kind::Parameter:
+            out += part.text;
+            break;
+        case Kind::Field:
+            out += value(row, part.field);
+            break;
+        case Kind::Page:
+            out += QString::number(pageIndex + 1);
+            break;
+        case Kind::Pages:
+            out += QString::number(pageCount());
+            break;
+        case Kind::Date:
+            out += m_printedAt.date().toString(QStringLiteral("dd.MM.yyyy"));
+            break;
+        case Kind::Time:
+            out += m_printedAt.time().toString(QStringLiteral("hh:mm"));
+            break;
+        }
+    }
     return out;
 }
 

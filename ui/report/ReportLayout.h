@@ -60,8 +60,21 @@ public:
     [[nodiscard]] const Page& page(int index) const { return m_pages.at(index); }
     [[nodiscard]] const ReportDefinition& definition() const { return m_definition; }
     [[nodiscard]] QSizeF paperDots() const { return m_definition.paper * kDotsPerMm; }
+    // A template split once into literal text and what its names stand for, so that painting a
+    // cell needs no parsing and no name lookup.
+    struct TemplatePart {
+        enum class Kind { Literal, Field, Parameter, Page, Pages, Date, Time };
+        Kind kind = Kind::Literal;
+        QString text; // Literal: the text; Parameter: its value
+        int field = -1;
+    };
+    using Template = QList<TemplatePart>;
+    [[nodiscard]] Template compile(const QString& templ) const;
     // The text of a template for one row on one page ({Seiten} is the count laid out so far).
     [[nodiscard]] QString expand(const QString& templ, int row, int pageIndex) const;
+    // The same into `out`; a template that is one field gives a view of the row's value and
+    // leaves `out` alone.
+    [[nodiscard]] QStringView expand(const Template& templ, int row, int pageIndex, QString& out) const;
     [[nodiscard]] QTextDocument* richDocument(const ReportItem* item) const;
     [[nodiscard]] bool isShaded(const ReportBand& band, int row) const;
 
@@ -88,6 +101,7 @@ private:
     ReportDataSource* m_source;
     QDateTime m_printedAt;
     QHash<QString, int> m_fieldIndex;
+    QList<int> m_shadeField; // per band of the definition: the field deciding its shade, or -1
     QList<Level> m_levels;
     const ReportBand* m_title = nullptr;
     const ReportBand* m_pageHeader = nullptr;

@@ -58,8 +58,20 @@ void paintRich(QPainter& painter, const ReportLayout& layout, const ReportLayout
     painter.restore();
 }
 
-// Fonts, their metrics and the glyphs of the texts already drawn, per item: shaping a cell's
-// text is most of a long report's time, and most cells repeat (dates, times, directions).
+// A text's hash and equality for the shaped-text cache, so that a cell's view of its row is
+// looked up without becoming a string of its own.
+struct TextHash {
+    using is_transparent = void;
+    size_t operator()(QStringView text) const noexcept { return qHash(text); }
+};
+struct TextEqual {
+    using is_transparent = void;
+    bool operator()(QStringView a, QStringView b) const noexcept { return a == b; }
+};
+
+// Fonts, their metrics, the compiled template and the glyphs of the texts already drawn, per
+// item: shaping a cell's text is most of a long report's time, and most cells repeat (dates,
+// times, directions).
 class FontCache {
 public:
     struct Shaped {
@@ -70,44 +82,55 @@ public:
         QFont font;
         QFontMetricsF metrics;
         QRawFont raw;
-        QHash<QString, Shaped> texts;
+        double ascent = 0;
+        double lineHeight = 0;
+        ReportLayout::Template templ;
+        std::unordered_map<QString, Shaped, TextHash, TextEqual> texts;
     };
 
-    Entry& of(const ReportDefinition& definition, const ReportItem& item)
+    Entry& of(const ReportLayout& layout, const ReportItem& item)
     {
         auto it = m_entries.find(&item);
         if (it == m_entries.end()) {
-            const QFont font = fontOf(definition, item.font);
-            it = m_entries.emplace(&item, Entry{font, QFontMetricsF(font), QRawFont::fromFont(font), {}}).first;
+            const QFont font = fontOf(layout.definition(), item.font);
+            const QFontMetricsF metrics(font);
+            it = m_entries
+                     .emplace(&item, Entry{font, metrics, QRawFont::fromFont(font), metrics.ascent(),
+                                           metrics.ascent() + metrics.descent(), layout.compile(item.text), {}})
+                     .first;
         }
         return it->second;
     }
 
-    const Shaped& shape(Entry& entry, const QString& text)
+    // Glyph positions are whole layout dots (1/1200 inch, far below what any printer shows):
+    // a PDF then carries short whole numbers for every glyph, which makes it smaller and quicker
+    // to write and compress.
+    const Shaped& shape(Entry& entry, QStringView text)
     {
-        if (auto found = entry.texts.constFind(text); found != entry.texts.cend())
-            return *found;
+        if (auto found = entry.texts.find(text); found != entry.texts.end())
+            return found->second;
         if (entry.texts.size() > kMaxTexts)
             entry.texts.clear();
         Shaped shaped;
-        const QList<quint32> glyphs = entry.raw.isValid() ? entry.raw.glyphIndexesForString(text) : QList<quint32>();
-        if (!glyphs.isEmpty() && !glyphs.contains(0u) && glyphs.size() == text.size()) {
+        const QString string = text.toString();
+        const QList<quint32> glyphs = entry.raw.isValid() ? entry.raw.glyphIndexesForString(string) : QList<quint32>();
+        if (!glyphs.isEmpty() && !glyphs.contains(0u) && glyphs.size() == string.size()) {
             const QList<QPointF> advances = entry.raw.advancesForGlyphIndexes(glyphs, QRawFont::KernedAdvances);
             QList<QPointF> positions;
             positions.reserve(glyphs.size());
             double x = 0;
             for (const QPointF& advance : advances) {
-                positions.append(QPointF(x, 0));
+                positions.append(QPointF(std::round(x), 0));
                 x += advance.x();
             }
             shaped.run.setRawFont(entry.raw);
             shaped.run.setGlyphIndexes(glyphs);
             shaped.run.setPositions(positions);
-            shaped.width = x;
+            shaped.width = std::round(x);
         } else {
-            shaped.width = entry.metrics.horizontalAdvance(text);
+            shaped.width = entry.metrics.horizontalAdvance(string);
         }
-        return *entry.texts.insert(text, shaped);
+        return entry.texts.emplace(string, std::move(shaped)).first->second;
     }
 
     // The glyphs of one page, gathered per font and colour and drawn in one run each: a PDF
@@ -116,8 +139,9 @@ public:
     {
         Batch& batch = m_batches[{&entry, color.rgba()}];
         batch.glyphs += shaped.run.glyphIndexes();
+        const QPointF origin(std::round(at.x()), std::round(at.y()));
         for (const QPointF& p : shaped.run.positions())
-            batch.positions.append(p + at);
+            batch.positions.append(p + origin);
     }
     void flush(QPainter& painter)
     {
@@ -135,12 +159,14 @@ public:
         }
     }
 
+    QString scratch; // a compound cell's text, reused from cell to cell
+
 private:
     struct Batch {
         QList<quint32> glyphs;
         QList<QPointF> positions;
     };
-    static constexpr qsizetype kMaxTexts = 20000;
+    static constexpr size_t kMaxTexts = 20000;
     std::map<std::pair<Entry*, QRgb>, Batch> m_batches;
     std::unordered_map<const ReportItem*, Entry> m_entries;
 };
@@ -149,26 +175,25 @@ void paintBand(QPainter& painter, const ReportLayout& layout, const ReportLayout
                FontCache& fonts)
 {
     const ReportBand& band = *placement.band;
-    const ReportDefinition& definition = layout.definition();
     if (placement.continued) {
         paintRich(painter, layout, placement);
         return;
     }
-    if (layout.isShaded(band, placement.row))
-        painter.fillRect(QRectF(0, placement.y, definition.printable().width() * kDpm, band.height * kDpm), band.shade);
     for (const ReportItem& item : band.items) {
         switch (item.kind) {
         case ReportItem::Kind::Text: {
-            FontCache::Entry& font = fonts.of(definition, item);
+            FontCache::Entry& font = fonts.of(layout, item);
             const QRectF box = dots(item.rect, placement.y);
-            QString text = layout.expand(item.text, placement.row, pageIndex);
+            QStringView text = layout.expand(font.templ, placement.row, pageIndex, fonts.scratch);
             if (text.isEmpty())
                 break;
             // Placed by hand rather than through drawText(rect, flags): the same result for one
             // line, without a text layout per cell.
             const FontCache::Shaped* shaped = &fonts.shape(font, text);
+            QString elided;
             if (shaped->width > box.width()) {
-                text = font.metrics.elidedText(text, Qt::ElideRight, box.width());
+                elided = font.metrics.elidedText(text.toString(), Qt::ElideRight, box.width());
+                text = elided;
                 shaped = &fonts.shape(font, text);
             }
             const double width = shaped->width;
@@ -177,17 +202,17 @@ void paintBand(QPainter& painter, const ReportLayout& layout, const ReportLayout
                 : h == Qt::AlignHCenter          ? box.left() + (box.width() - width) / 2
                                                  : box.left();
             const Qt::Alignment v = item.align & Qt::AlignVertical_Mask;
-            const double lineHeight = font.metrics.ascent() + font.metrics.descent();
+            const double lineHeight = font.lineHeight;
             const double top = v == Qt::AlignTop ? box.top()
                 : v == Qt::AlignBottom           ? box.bottom() - lineHeight
                                                  : box.top() + (box.height() - lineHeight) / 2;
-            const QPointF baseline(x, top + font.metrics.ascent());
+            const QPointF baseline(x, top + font.ascent);
             if (!shaped->run.isEmpty()) {
                 fonts.add(font, item.color, *shaped, baseline);
             } else {
                 painter.setPen(item.color);
                 painter.setFont(font.font);
-                painter.drawText(baseline, text);
+                painter.drawText(baseline, text.toString());
             }
             break;
         }
@@ -214,6 +239,31 @@ void paintBand(QPainter& painter, const ReportLayout& layout, const ReportLayout
     }
 }
 
+// The shaded rows of a page, first and in one call per colour: bands do not overlap, so nothing
+// a band draws lies under another band's shade.
+void paintShading(QPainter& painter, const ReportLayout& layout, const QList<ReportLayout::Placement>& placements)
+{
+    std::map<QRgb, QList<QRectF>> shades;
+    const double width = std::round(layout.definition().printable().width() * kDpm);
+    for (const ReportLayout::Placement& placement : placements) {
+        if (placement.continued || !layout.isShaded(*placement.band, placement.row))
+            continue;
+        // Whole dots, top and bottom rounded alike, so that neighbouring rows neither gap nor overlap.
+        const double top = std::round(placement.y);
+        const double bottom = std::round(placement.y + placement.band->height * kDpm);
+        shades[placement.band->shade.rgba()].append(QRectF(0, top, width, bottom - top));
+    }
+    if (shades.empty())
+        return;
+    painter.save();
+    painter.setPen(Qt::NoPen);
+    for (const auto& [colour, rects] : shades) {
+        painter.setBrush(QColor::fromRgba(colour));
+        painter.drawRects(rects.constData(), int(rects.size()));
+    }
+    painter.restore();
+}
+
 void paintPageWith(QPainter& painter, const ReportLayout& layout, int pageIndex, const QRectF& target, FontCache& fonts)
 {
     const QSizeF paper = layout.paperDots();
@@ -226,9 +276,12 @@ void paintPageWith(QPainter& painter, const ReportLayout& layout, int pageIndex,
     painter.setRenderHint(QPainter::TextAntialiasing);
     const QMarginsF& margins = layout.definition().margins;
     painter.translate(margins.left() * kDpm, margins.top() * kDpm);
-    if (pageIndex >= 0 && pageIndex < layout.pageCount())
-        for (const ReportLayout::Placement& placement : layout.page(pageIndex).placements)
+    if (pageIndex >= 0 && pageIndex < layout.pageCount()) {
+        const QList<ReportLayout::Placement>& placements = layout.page(pageIndex).placements;
+        paintShading(painter, layout, placements);
+        for (const ReportLayout::Placement& placement : placements)
             paintBand(painter, layout, placement, pageIndex, fonts);
+    }
     fonts.flush(painter);
     painter.restore();
 }
@@ -243,6 +296,8 @@ void ReportRenderer::paintPage(QPainter& painter, const ReportLayout& layout, in
 
 void ReportRenderer::print(QPagedPaintDevice* device, ReportLayout& layout, int from, int to, int copies)
 {
+    if (!device)
+        throw AppException(QStringLiteral("Es ist kein Drucker mehr verfügbar."));
     layout.layoutAll();
     from = std::max(from, 1);
     to = std::min(to, layout.pageCount());
@@ -273,6 +328,10 @@ void ReportRenderer::print(QPagedPaintDevice* device, ReportLayout& layout, int 
     }
     if (!painter.end())
         throw AppException(QStringLiteral("Der Bericht konnte nicht vollständig ausgegeben werden."));
+    // A printer that failed while pages were painted says so only in its state.
+    if (auto* printer = dynamic_cast<QPrinter*>(device);
+        printer && (printer->printerState() == QPrinter::Error || printer->printerState() == QPrinter::Aborted))
+        throw AppException(QStringLiteral("Der Drucker hat den Auftrag abgebrochen."));
 }
 
 void ReportRenderer::writePdf(const QString& path, ReportLayout& layout)

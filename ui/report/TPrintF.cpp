@@ -27,7 +27,19 @@ PrintTarget systemPrinters()
 {
     return PrintTarget{[] { return !QPrinterInfo::availablePrinterNames().isEmpty(); },
                        []() -> std::unique_ptr<QPagedPaintDevice> {
-                           return std::make_unique<QPrinter>(QPrinterInfo::defaultPrinter(), QPrinter::HighResolution);
+                           // The default printer, else the first there is; none when every
+                           // printer has gone since the preview opened.
+                           QPrinterInfo info = QPrinterInfo::defaultPrinter();
+                           if (info.isNull()) {
+                               const QStringList names = QPrinterInfo::availablePrinterNames();
+                               if (names.isEmpty())
+                                   return nullptr;
+                               info = QPrinterInfo::printerInfo(names.first());
+                           }
+                           auto printer = std::make_unique<QPrinter>(info, QPrinter::HighResolution);
+                           if (!printer->isValid())
+                               return nullptr;
+                           return printer;
                        }};
 }
 
@@ -164,8 +176,9 @@ void TPrintF::AdvTB1Click()
             m_preview->layoutAll();
             std::unique_ptr<QPagedPaintDevice> device = printTarget().open();
             ReportRenderer::print(device.get(), m_preview->layout(), from, to, copies);
-        } catch (const AppException& e) {
+        } catch (const std::exception& e) {
             reportError(QStringLiteral("Der Bericht konnte nicht gedruckt werden."), &e);
+            m_preview->updatePrintAction();
         }
     }
     close();

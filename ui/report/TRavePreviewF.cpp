@@ -208,7 +208,7 @@ TRavePreviewF::TRavePreviewF(ReportLayout& layout, const QString& title, QWidget
     }
     column->addWidget(m_status);
 
-    m_print->setEnabled(printTarget().available && printTarget().available());
+    updatePrintAction();
     // Saving as PDF needs no printer; it is offered on purpose.
     m_pdf->setEnabled(true);
 
@@ -279,6 +279,11 @@ void TRavePreviewF::layoutAll()
 {
     while (!m_layout.finished() && !m_failed)
         layoutStep();
+}
+
+void TRavePreviewF::updatePrintAction()
+{
+    m_print->setEnabled(printTarget().available && printTarget().available());
 }
 
 void TRavePreviewF::showPage(int page)

@@ -50,6 +50,9 @@ public:
     [[nodiscard]] double fitPageZoom() const;
     // Lays the rest of the report out now (printing and PDF need every page).
     void layoutAll();
+    // "Drucken" is enabled while a printer is installed; asked again after a failed job, since
+    // the printer may be the one that went away.
+    void updatePrintAction();
 
     static constexpr double kZoomStep = 10;
 
