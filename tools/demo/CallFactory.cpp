@@ -118,6 +118,9 @@ CallRow CallFactory::callWith(const QDate& day, const Caller& caller, int ctype)
     const int hour = 7 + int(m_rng.bounded(8)) + int(m_rng.bounded(7));
     row.time = QTime(hour, int(m_rng.bounded(60)), int(m_rng.bounded(60)));
     row.fromPhone = caller.number;
+    // The monitor writes the number as the caller's text until a contact claims it; printed
+    // reports show this text as it is stored.
+    row.fromBez = caller.number;
     row.region = caller.region;
     row.ntype = caller.ntype;
     const int dir = int(m_rng.bounded(100));
