@@ -8,6 +8,7 @@
 #include <QThread>
 
 #include <algorithm>
+#include <atomic>
 
 namespace orvanta {
 
@@ -22,6 +23,14 @@ void rollbackAndReport(FbTransaction* transaction, QStringView label, const std:
 }
 
 namespace detail {
+namespace {
+std::atomic<long long> g_lockConflictRetries{0};
+} // namespace
+
+long long lockConflictRetries()
+{
+    return g_lockConflictRetries.load();
+}
 
 bool runTransactionWork(FbTransaction& transaction, QStringView label, const std::function<bool()>& work,
                         ErrorReport report)
@@ -40,6 +49,7 @@ bool runTransactionWork(FbTransaction& transaction, QStringView label, const std
             // same rows: a moment later the unit runs against a fresh snapshot and goes through.
             if (e.isLockConflict() && attempt + 1 < kLockConflictAttempts) {
                 transaction.rollbackQuietly();
+                ++g_lockConflictRetries;
                 QThread::msleep(lockConflictPause(attempt));
                 continue;
             }

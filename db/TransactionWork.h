@@ -46,6 +46,8 @@ namespace detail {
 inline constexpr int kLockConflictAttempts = 10;
 // The pause before the next attempt, in milliseconds, after attempt 0, 1, …
 unsigned long lockConflictPause(int attempt);
+// How many units this process has run again after a lock conflict (for load measurements).
+[[nodiscard]] long long lockConflictRetries();
 bool runTransactionWork(FbTransaction& transaction, QStringView label, const std::function<bool()>& work,
                         ErrorReport report);
 } // namespace detail
