@@ -4,6 +4,9 @@
 // [<called number>]", "CONTACT <log id>", "STATE"); logs calls into the database and tells the
 // program. One runs at a time: it holds the mutex "Varnik Rufwarte" while it runs.
 
+#include "platform/RufwarteIni.h"
+
+#include <QDateTime>
 #include <QObject>
 #include <QTimer>
 
@@ -19,6 +22,8 @@ class NamedMutex;
 
 namespace orvanta::rufwarte {
 
+class RouterSource;
+
 class Monitor final : public QObject {
     Q_OBJECT
 
@@ -31,8 +36,10 @@ public:
     // Whether a monitor runs now (holds the mutex, or answers on the socket).
     [[nodiscard]] static bool isRunning();
 
+    enum class DatabaseAtStart { Required, MayFollow };
     // Connects with the registry's connection data and opens the socket; false with a message.
-    bool start(QString& error);
+    // MayFollow: a database out of reach is reported and tried again when there is a call.
+    bool start(QString& error, DatabaseAtStart database = DatabaseAtStart::Required);
     [[nodiscard]] bool isPaused() const { return m_paused; }
     // Logs a random call every few seconds (0 = never).
     void setAutoCallInterval(int seconds);
@@ -42,6 +49,9 @@ public:
 
     // The program's message socket: tells it about a new call or asks for a contact.
     static bool tellProgram(int message, qint64 wParam);
+
+    // Takes the calls of a router's call monitor from now on (pausing applies to them too).
+    void watchRouter(RouterSource* source);
 
 Q_SIGNALS:
     void quitRequested();
@@ -57,12 +67,43 @@ private:
     QLocalServer* m_server = nullptr;
     QTimer m_autoCall;
     QTimer m_socketWatch;
+    RouterSource* m_router = nullptr;
     bool m_paused = false;
+};
+
+// One finished call as the log keeps it.
+struct LoggedCall {
+    enum Direction { Incoming = 0, Outgoing = 1 }; // the values of LOG.CTYPE
+    int direction = Incoming;
+    QString number;    // the other party (caller or called); empty when the caller withheld it
+    QString ownNumber; // the own number (MSN) called or used
+    bool answered = false;
+    QDateTime start;
+    int durationSeconds = 0;
+    // Read back from the queue file: it may have been written just before the monitor ended, so
+    // an identical row means it is logged already.
+    bool mayBeLogged = false;
+};
+
+enum class WriteResult {
+    Written,
+    LockConflict, // another writer held a row or took the key: worth trying again at once
+    Failed,       // the database refused or is gone: the attachment is not to be trusted
 };
 
 // Connects to the database named in the monitor's registry key. Throws AppException.
 std::unique_ptr<FbAttachment> connectFromRegistry();
-// Inserts one incoming call now; returns its key. Throws AppException.
+// Writes one LOG row for a call in one transaction: the caller's text is the contact's name when a
+// stored number matches, else the number, "Nummer unterdrückt" when withheld; the region comes
+// from the area-code tables, the own number's name from the MSN list. `lid` gets the new key,
+// `error` the reason of a failure.
+WriteResult writeCall(FbAttachment& db, const LoggedCall& call, const QList<MsnRecord>& msns, int& lid,
+                      QString& error);
+// Inserts one incoming unanswered call now; returns its key. Throws AppException.
 int insertCall(FbAttachment& db, const QString& fromPhone, const QString& onMsn);
+// One line of the monitor's output (standard output, flushed).
+void say(const QString& text);
+// The MSN list of the program folder.
+[[nodiscard]] QList<MsnRecord> programFolderMsns();
 
 } // namespace orvanta::rufwarte

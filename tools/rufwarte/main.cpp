@@ -3,8 +3,11 @@
 //   rufwarte setup [--program-folder DIR] [--database PATH] [--no-demo] [--force]
 //       creates the call database (demo content unless --no-demo), the monitor's registry key
 //       ($VARNIK_HKLM) and the settings files of the program folder
-//   rufwarte [run] [--auto-calls SECONDS]
-//       runs the monitor: answers quit and pause/resume, logs calls on request
+//   rufwarte [run] [--auto-calls SECONDS] [--router HOST[:PORT]] [--retry-ms MS]
+//       runs the monitor: answers quit and pause/resume, logs calls on request; with a router
+//       (the option, else the key "ROUTER" of "ISDNStore", section "MoniOptions") it logs every
+//       call the router's call monitor reports (port 1012 unless given); MS is the first pause
+//       before a new attempt at the router or the database (default 1000, doubling up to 30 times)
 //   rufwarte call NUMBER [--msn MSN] [--post]
 //       logs an incoming call now and tells the program (through the running monitor if any)
 //   rufwarte contact LOGID      asks the program to make a contact of that call's caller
@@ -18,10 +21,13 @@
 #include "db/FbAttachment.h"
 #include "phone/AreaCodes.h"
 #include "platform/AppException.h"
+#include "platform/IniFile.h"
+#include "platform/RufwarteIni.h"
 #include "platform/NamedMutex.h"
 #include "platform/ProgramFolder.h"
 #include "tools/rufwarte/Monitor.h"
 #include "tools/rufwarte/MonitorSetup.h"
+#include "tools/rufwarte/RouterSource.h"
 
 #include <QCommandLineParser>
 #include <QCoreApplication>
@@ -32,6 +38,7 @@
 #include <QLocalSocket>
 #include <QThread>
 
+#include <algorithm>
 #include <csignal>
 #include <cstdio>
 
@@ -61,18 +68,47 @@ bool askMonitor(const QByteArray& command, QByteArray& answer)
     return true;
 }
 
-int runMonitor(int autoCalls)
+// The router named on the command line, else in the monitor's settings; empty: none.
+QString routerAddress(const QString& option)
 {
+    if (!option.isEmpty())
+        return option;
+    const IniFile ini(programFolder() + QString::fromLatin1(TRufwarteIni::kSettingsFile));
+    return ini.readString(QString::fromLatin1(TRufwarteIni::kSection), QStringLiteral("ROUTER")).trimmed();
+}
+
+int runMonitor(int autoCalls, const QString& router, int retryMs)
+{
+    QString host;
+    quint16 port = 0;
+    if (!router.isEmpty() && !rufwarte::RouterSource::parseAddress(router, host, port)) {
+        print(stderr, QStringLiteral("Ungültige Adresse des Routers: \"%1\" (erwartet: Name oder Adresse, "
+                                     "optional mit \":Port\").").arg(router));
+        return 2;
+    }
     LoadGermanAereaCodes();
     LoadAustriaAereaCodes();
     LoadSwissAereaCodes();
     rufwarte::Monitor monitor;
     QString error;
-    if (!monitor.start(error)) {
+    if (!monitor.start(error, host.isEmpty() ? rufwarte::Monitor::DatabaseAtStart::Required
+                                             : rufwarte::Monitor::DatabaseAtStart::MayFollow)) {
         print(stderr, error);
         return 1;
     }
     monitor.setAutoCallInterval(autoCalls);
+    if (!host.isEmpty()) {
+        rufwarte::RouterSource::Timing timing;
+        if (retryMs > 0) {
+            timing.firstRetryMs = retryMs;
+            timing.maxRetryMs = 30 * retryMs;
+            timing.lockRetryMs = std::max(retryMs / 5, 1);
+        }
+        monitor.watchRouter(new rufwarte::RouterSource(host, port, &rufwarte::connectFromRegistry,
+                                                       rufwarte::programFolderMsns(), timing,
+                                                       programFolder() + QString::fromLatin1(
+                                                           rufwarte::RouterSource::QueueFileName)));
+    }
     QObject::connect(&monitor, &rufwarte::Monitor::quitRequested, qApp, &QCoreApplication::quit, Qt::QueuedConnection);
     std::signal(SIGTERM, [](int) { QCoreApplication::quit(); });
     std::signal(SIGINT, [](int) { QCoreApplication::quit(); });
@@ -103,7 +139,13 @@ int main(int argc, char* argv[])
     const QCommandLineOption msnOpt(QStringLiteral("msn"), QStringLiteral("angerufene Nummer"), QStringLiteral("msn"),
                                     QStringLiteral("3012345670"));
     const QCommandLineOption postOpt(QStringLiteral("post"), QStringLiteral("Nachricht einreihen statt senden"));
-    for (const auto* o : {&folderOpt, &dbOpt, &noDemoOpt, &forceOpt, &autoOpt, &msnOpt, &postOpt})
+    const QCommandLineOption routerOpt(QStringLiteral("router"),
+                                       QStringLiteral("Anrufmonitor des Routers (Host[:Port], Port 1012 ohne Angabe)"),
+                                       QStringLiteral("host"));
+    const QCommandLineOption retryOpt(QStringLiteral("retry-ms"),
+                                      QStringLiteral("erste Pause vor einem neuen Verbindungsversuch in ms"),
+                                      QStringLiteral("ms"), QStringLiteral("0"));
+    for (const auto* o : {&folderOpt, &dbOpt, &noDemoOpt, &forceOpt, &autoOpt, &msnOpt, &postOpt, &routerOpt, &retryOpt})
         parser.addOption(*o);
     parser.process(app);
 
@@ -135,7 +177,8 @@ int main(int argc, char* argv[])
         return 0;
     }
     if (command == QLatin1String("run"))
-        return runMonitor(parser.value(autoOpt).toInt());
+        return runMonitor(parser.value(autoOpt).toInt(), routerAddress(parser.value(routerOpt)),
+                          parser.value(retryOpt).toInt());
     if (command == QLatin1String("call") && args.size() == 2) {
         QByteArray answer;
         const QByteArray line = "CALL " + args[1].toUtf8() + ' ' + parser.value(msnOpt).toUtf8()
