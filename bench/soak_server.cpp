@@ -1,9 +1,9 @@
 // Load and faults on a real Firebird server (not a timed benchmark): the monitor `rufwarte`
-// writes calls at a steady rate through the server while the program, offscreen in this process,
+// takes calls from a fake router at a steady rate and writes them through the server while the program, offscreen in this process,
 // refreshes its log list on every log-changed message, deletes a day, relinks a number and saves
 // remarks, and a second desk changes the same rows from its own attachment. Then the monitor and
 // the server are killed in the middle of writing and the server restarted: the database must
-// validate clean and every call the monitor reported written must be there.
+// validate clean and, once the monitor runs again, every call the router finished must be there.
 //
 //   soak_server [--seconds N] [--rate CALLS_PER_SECOND] [--quiet N] [--dir FOLDER]
 //
@@ -25,7 +25,9 @@
 #include <QApplication>
 #include <QElapsedTimer>
 #include <QLineEdit>
-#include <QLocalSocket>
+#include <QHostAddress>
+#include <QTcpServer>
+#include <QTcpSocket>
 #include <QProcess>
 #include <QSet>
 #include <QThread>
@@ -137,54 +139,65 @@ private:
     int m_lid = 0;
 };
 
-// Sends "CALL number msn" lines to the running monitor at the rate and collects the log ids it
-// answers with: an id is a call the monitor has committed.
-class CallWriter final {
+// The router's call monitor: a TCP port on 127.0.0.1 that `rufwarte run --router` connects to,
+// sending each call as RING, CONNECT and DISCONNECT at the rate. A call is finished once its
+// DISCONNECT is written; each has a talk time of its own, so no two rows are alike.
+class FakeRouter final {
 public:
-    explicit CallWriter(int rate)
+    explicit FakeRouter(int rate)
         : m_rate(rate)
     {
-        QObject::connect(&m_socket, &QLocalSocket::readyRead, [this] {
-            while (m_socket.canReadLine()) {
-                const int lid = m_socket.readLine().trimmed().toInt();
-                if (lid > 0)
-                    written.insert(lid);
-                else
-                    ++refused;
+        QObject::connect(&m_server, &QTcpServer::newConnection, [this] {
+            while (QTcpSocket* s = m_server.nextPendingConnection()) {
+                delete m_client;
+                m_client = s;
             }
         });
         QObject::connect(&m_tick, &QTimer::timeout, [this] { send(); });
+        m_server.listen(QHostAddress::LocalHost);
     }
-    bool start()
+    ~FakeRouter() { delete m_client; }
+    [[nodiscard]] quint16 port() const { return m_server.serverPort(); }
+    [[nodiscard]] bool connected() const
     {
-        m_socket.connectToServer(MonitorLink::monitorSocketPath());
-        if (!m_socket.waitForConnected(5000))
-            return false;
+        return m_client && m_client->state() == QAbstractSocket::ConnectedState;
+    }
+    void start()
+    {
         m_clock.start();
-        m_base = sent;
+        m_base = finished;
         m_tick.start(5);
-        return true;
     }
     void stop() { m_tick.stop(); }
-    [[nodiscard]] qint64 outstanding() const { return sent - written.size() - refused; }
 
-    QSet<int> written;
-    qint64 sent = 0;
-    qint64 refused = 0;
+    qint64 finished = 0;
+    qint64 recurring = 0; // calls from the number the user relinks
+
+    static QString number(qint64 n) { return n % 5 == 0 ? QStringLiteral("0301234567") : QStringLiteral("089%1").arg(2000000 + n); }
 
 private:
     void send()
     {
+        if (!connected())
+            return;
         const qint64 due = m_base + m_clock.elapsed() * m_rate / 1000;
+        const QByteArray stamp = QDateTime::currentDateTime().toString(QStringLiteral("dd.MM.yy HH:mm:ss")).toLatin1();
         QByteArray lines;
-        for (; sent < due; ++sent)
-            lines += "CALL " + callerNumber(sent).toLatin1() + " 3012345670 post\n";
+        for (; finished < due; ++finished) {
+            const QByteArray id = QByteArray::number(finished % 40);
+            const QByteArray from = number(finished).toLatin1();
+            recurring += finished % 5 == 0 ? 1 : 0;
+            lines += stamp + ";RING;" + id + ';' + from + ";3012345670;SIP0;\r\n";
+            lines += stamp + ";CONNECT;" + id + ";1;" + from + ";\r\n";
+            lines += stamp + ";DISCONNECT;" + id + ';' + QByteArray::number(1 + finished) + ";\r\n";
+        }
         if (!lines.isEmpty())
-            m_socket.write(lines);
+            m_client->write(lines);
     }
 
     int m_rate;
-    QLocalSocket m_socket;
+    QTcpServer m_server;
+    QTcpSocket* m_client = nullptr;
     QTimer m_tick;
     QElapsedTimer m_clock;
     qint64 m_base = 0;
@@ -272,45 +285,82 @@ QStringList errorLogEntries(const QString& path)
     return entries;
 }
 
-QSet<int> logIds(const QString& database, const QString& password)
+// The numbers of today's calls in LOG, each as often as it is there.
+QHash<QString, int> callsOfToday(const QString& database, const QString& password)
 {
     FbAttachment db;
     db.attach(database, QStringLiteral("SYSDBA"), password);
     FbTransaction tx(db);
     tx.start();
-    FbStatement st(db, &tx, QStringLiteral("SELECT LID FROM LOG"));
+    FbStatement st(db, &tx, QStringLiteral("SELECT FROMPHONE FROM LOG WHERE TSDATE = CURRENT_DATE"));
     st.execute();
-    QSet<int> ids;
+    QHash<QString, int> numbers;
     while (st.next())
-        ids.insert(st.asInt(0));
+        ++numbers[st.asString(0)];
     tx.commit();
-    return ids;
+    return numbers;
 }
 
-qint64 missingFrom(const QSet<int>& written, const QSet<int>& stored)
+// The first `finished` calls of the router that are not in LOG.
+qint64 missingCalls(qint64 finished, const QHash<QString, int>& stored)
 {
     qint64 missing = 0;
-    for (int lid : written)
-        missing += stored.contains(lid) ? 0 : 1;
-    return missing;
+    qint64 recurring = 0;
+    for (qint64 n = 0; n < finished; ++n) {
+        if (n % 5 == 0)
+            ++recurring;
+        else
+            missing += stored.contains(FakeRouter::number(n)) ? 0 : 1;
+    }
+    return missing + std::max<qint64>(0, recurring - stored.value(FakeRouter::number(0)));
 }
 
-std::unique_ptr<QProcess> startMonitor()
+qint64 rows(const QHash<QString, int>& stored)
+{
+    qint64 n = 0;
+    for (int c : stored)
+        n += c;
+    return n;
+}
+
+std::unique_ptr<QProcess> startMonitor(const FakeRouter& router, const QString& folder)
 {
     auto monitor = std::make_unique<QProcess>();
-    monitor->setProcessChannelMode(QProcess::ForwardedErrorChannel);
-    monitor->setStandardOutputFile(QProcess::nullDevice());
-    monitor->start(QCoreApplication::applicationDirPath() + QStringLiteral("/rufwarte"), {QStringLiteral("run")});
+    monitor->setProcessChannelMode(QProcess::MergedChannels);
+    monitor->setStandardOutputFile(folder + QStringLiteral("/rufwarte.out"), QIODevice::Append);
+    monitor->start(QCoreApplication::applicationDirPath() + QStringLiteral("/rufwarte"),
+                   {QStringLiteral("run"), QStringLiteral("--router"), QStringLiteral("127.0.0.1:%1").arg(router.port()),
+                    QStringLiteral("--retry-ms"), QStringLiteral("200"), QStringLiteral("--program-folder"), folder});
     if (!monitor->waitForStarted(5000))
         return nullptr;
     QElapsedTimer t;
     t.start();
-    while (!MonitorLink::sendLine(MonitorLink::monitorSocketPath(), 0, 0, 0, 300)) {
+    while (!router.connected()) {
         if (t.elapsed() > 20000 || monitor->state() != QProcess::Running)
             return nullptr;
-        QThread::msleep(50);
+        QCoreApplication::processEvents(QEventLoop::AllEvents, 50);
     }
     return monitor;
+}
+
+// Until LOG holds `expected` calls of today or nothing changed for `quietMs`.
+qint64 waitForRows(const QString& database, const QString& password, qint64 expected, int quietMs)
+{
+    qint64 last = -1;
+    QElapsedTimer unchanged;
+    unchanged.start();
+    for (;;) {
+        const qint64 now = rows(callsOfToday(database, password));
+        if (now >= expected)
+            return now;
+        if (now != last) {
+            last = now;
+            unchanged.restart();
+        } else if (unchanged.elapsed() > quietMs) {
+            return now;
+        }
+        runEventsFor(200);
+    }
 }
 
 } // namespace
@@ -385,28 +435,29 @@ int main(int argc, char* argv[])
     }
     LogMaintenance maintenance(dm.get());
 
-    std::unique_ptr<QProcess> monitor = startMonitor();
+    FakeRouter router(options->rate);
+    std::unique_ptr<QProcess> monitor = startMonitor(router, temp->path());
     if (!monitor) {
-        std::fprintf(stderr, "rufwarte does not start\n");
+        std::fprintf(stderr, "rufwarte does not start or does not reach the router\n");
         return 1;
     }
     SecondDesk desk(database, server.password());
     desk.start();
 
-    // The user's work, a step every quarter second in turn: a remark, a relinking, a day deleted.
+    // The user's work, a step every quarter second in turn: a remark on the newest call, the
+    // recurring number relinked, an earlier day deleted.
     int remarks = 0;
     int relinks = 0;
     int deletions = 0;
     int failedSteps = 0;
     int step = 0;
-    CallWriter writer(options->rate);
     QTimer user;
     QObject::connect(&user, &QTimer::timeout, [&] {
         switch (step++ % 3) {
         case 0: {
-            if (writer.written.isEmpty())
+            const int lid = dm->CurLogLID;
+            if (lid <= 0)
                 return;
-            const int lid = *std::max_element(writer.written.cbegin(), writer.written.cend());
             desk.target = lid;
             TLogDetailForm form(dm.get(), lid);
             form.setHostWindow(&host);
@@ -415,8 +466,7 @@ int main(int argc, char* argv[])
             break;
         }
         case 1:
-            maintenance.LogbuchAnpassen(QStringLiteral("0301234567"), QStringLiteral("Büro"), 7,
-                                        QStringLiteral("Muster GmbH"))
+            maintenance.LogbuchAnpassen(FakeRouter::number(0), QStringLiteral("Büro"), 7, QStringLiteral("Muster GmbH"))
                 ? ++relinks
                 : ++failedSteps;
             break;
@@ -427,20 +477,15 @@ int main(int argc, char* argv[])
     });
 
     const qint64 rssStart = residentKiB();
-    if (!writer.start()) {
-        std::fprintf(stderr, "cannot reach the monitor\n");
-        return 1;
-    }
+    router.start();
     user.start(250);
     QElapsedTimer clock;
     clock.start();
     runEventsFor(options->seconds * 1000);
-    writer.stop();
-    // The monitor's last answers.
-    QElapsedTimer drain;
-    drain.start();
-    while (writer.outstanding() > 0 && drain.elapsed() < 30000)
-        runEventsFor(50);
+    router.stop();
+    const double sendSeconds = double(clock.elapsed()) / 1000.0;
+    // The monitor's last rows.
+    const qint64 inLog = waitForRows(database, server.password(), router.finished, 10000);
     const double writeSeconds = double(clock.elapsed()) / 1000.0;
     runEventsFor(500);
     const qint64 rssEndOfWriting = residentKiB();
@@ -455,19 +500,19 @@ int main(int argc, char* argv[])
     desk.stop();
     const qint64 rssQuiet = residentKiB();
 
-    const QSet<int> stored = logIds(database, server.password());
-    const qint64 missing = missingFrom(writer.written, stored);
+    const QHash<QString, int> stored = callsOfToday(database, server.password());
+    const qint64 missing = missingCalls(router.finished, stored);
     const int dialogErrors = dialogs->count();
-    say(QStringLiteral("writing: %1 s at %2 calls/s").arg(writeSeconds, 0, 'f', 1).arg(options->rate));
-    say(QStringLiteral("calls sent %1, written (acknowledged by rufwarte) %2, refused %3, unanswered %4")
-            .arg(writer.sent)
-            .arg(writer.written.size())
-            .arg(writer.refused)
-            .arg(writer.outstanding()));
-    say(QStringLiteral("calls in LOG %1 of %2 written, missing %3")
-            .arg(writer.written.size() - missing)
-            .arg(writer.written.size())
-            .arg(missing));
+    say(QStringLiteral("router: %1 calls finished in %2 s (%3 calls/s asked); rufwarte had them in LOG after %4 s")
+            .arg(router.finished)
+            .arg(sendSeconds, 0, 'f', 1)
+            .arg(options->rate)
+            .arg(writeSeconds, 0, 'f', 1));
+    say(QStringLiteral("calls written %1, calls in LOG %2, missing %3, more than finished %4")
+            .arg(router.finished)
+            .arg(inLog)
+            .arg(missing)
+            .arg(std::max<qint64>(0, rows(stored) - router.finished)));
     say(QStringLiteral("log-changed messages %1, refreshes %2 (%3 while writing), longest refresh %4 ms, mean %5 ms")
             .arg(host.messages)
             .arg(host.refreshes)
@@ -484,7 +529,7 @@ int main(int argc, char* argv[])
             .arg(desk.conflicts.load())
             .arg(desk.failures.load()));
     const QStringList logged = errorLogEntries(errorLog.filePath());
-    say(QStringLiteral("errors: dialogs %1, error log entries %2; writes run again after a lock conflict: %3")
+    say(QStringLiteral("errors: dialogs %1, error log entries %2; program writes run again after a lock conflict: %3")
             .arg(dialogErrors)
             .arg(logged.size())
             .arg(detail::lockConflictRetries()));
@@ -498,27 +543,25 @@ int main(int argc, char* argv[])
             .arg(double(rssQuiet) / 1024.0, 0, 'f', 1)
             .arg(options->quiet));
 
-    // Faults: the monitor and the server killed while calls are being written.
-    CallWriter burst(options->rate);
-    if (!burst.start()) {
-        std::fprintf(stderr, "cannot reach the monitor\n");
-        return 1;
-    }
+    // Faults: calls keep coming, and the monitor and the server are killed while it writes them.
+    router.start();
     runEventsFor(3000);
+    router.stop();
+    const qint64 beforeKill = rows(callsOfToday(database, server.password()));
     ::kill(static_cast<pid_t>(monitor->processId()), SIGKILL);
     server.kill();
-    burst.stop();
     monitor->waitForFinished(5000);
     runEventsFor(200);
     const int dialogsBefore = dialogs->count();
     const bool programConnected = dm->DBConnect();
-    say(QStringLiteral("killed rufwarte and the server after %1 acknowledged calls (%2 unanswered); the program "
-                       "still runs, connected: %3, says: %4")
-            .arg(burst.written.size())
-            .arg(burst.outstanding())
+    say(QStringLiteral("killed rufwarte and the server with %1 of %2 finished calls in LOG; the program still runs, "
+                       "connected: %3, says: %4")
+            .arg(beforeKill)
+            .arg(router.finished)
             .arg(programConnected ? QStringLiteral("yes") : QStringLiteral("no"))
-            .arg(dialogs->count() > dialogsBefore ? QString(dialogs->last().text).replace(QStringLiteral("\r\n"), QStringLiteral(" | "))
-                                                  : QStringLiteral("nothing")));
+            .arg(dialogs->count() > dialogsBefore
+                     ? QString(dialogs->last().text).replace(QStringLiteral("\r\n"), QStringLiteral(" | "))
+                     : QStringLiteral("nothing")));
     host.refresh(0); // a refresh on the dead connection: logged, no crash
     if (!server.start()) {
         std::fprintf(stderr, "the server does not start again: %s\n", qPrintable(server.error()));
@@ -529,14 +572,49 @@ int main(int argc, char* argv[])
                                     {QStringLiteral("-v"), QStringLiteral("-full"), QStringLiteral("-user"),
                                      QStringLiteral("SYSDBA"), QStringLiteral("-password"), server.password(), database},
                                     &validation);
-    say(QStringLiteral("gfix -v -full: exit %1, %2").arg(gfix).arg(validation.trimmed().isEmpty()
-                                                                     ? QStringLiteral("no findings")
-                                                                     : QString::fromLocal8Bit(validation.trimmed())));
-    QSet<int> all = writer.written;
-    all.unite(burst.written);
-    const QSet<int> after = logIds(database, server.password());
-    const qint64 lost = missingFrom(all, after);
-    say(QStringLiteral("after restart: %1 of %2 acknowledged calls in LOG, lost %3").arg(all.size() - lost).arg(all.size()).arg(lost));
+    say(QStringLiteral("gfix -v -full: exit %1, %2")
+            .arg(gfix)
+            .arg(validation.trimmed().isEmpty() ? QStringLiteral("no findings")
+                                                : QString::fromLocal8Bit(validation.trimmed())));
+    // What rufwarte had taken in when it was killed: its rows in LOG and the calls waiting in its
+    // queue file. Calls still unread in its socket were never its to lose.
+    QHash<QString, int> known = callsOfToday(database, server.password());
+    const qint64 committed = rows(known);
+    qint64 queued = 0;
+    {
+        QFile queue(temp->filePath(QStringLiteral("CallQueue")));
+        if (queue.open(QIODevice::ReadOnly)) {
+            for (const QByteArray& line : queue.readAll().split('\n')) {
+                const QList<QByteArray> fields = line.split('\t');
+                if (fields.size() != 6)
+                    continue;
+                ++queued;
+                const QString number = QString::fromLatin1(fields[4]);
+                if (number == FakeRouter::number(0) || !known.contains(number))
+                    ++known[number];
+            }
+        }
+    }
+    monitor = startMonitor(router, temp->path());
+    const qint64 afterRestart = monitor ? waitForRows(database, server.password(), rows(known), 10000)
+                                        : rows(callsOfToday(database, server.password()));
+    const QHash<QString, int> final = callsOfToday(database, server.password());
+    qint64 lost = 0;
+    for (auto it = known.cbegin(); it != known.cend(); ++it)
+        lost += std::max(0, it.value() - final.value(it.key()));
+    say(QStringLiteral("at the kill: %1 calls committed, %2 in rufwarte's queue file, %3 finished at the router but "
+                       "still unread in rufwarte's socket")
+            .arg(committed)
+            .arg(queued)
+            .arg(std::max<qint64>(0, router.finished - rows(known))));
+    say(QStringLiteral("after restarting both: %1 calls in LOG; of the %2 rufwarte had taken in, lost %3")
+            .arg(afterRestart)
+            .arg(rows(known))
+            .arg(lost));
+    if (monitor) {
+        monitor->terminate();
+        monitor->waitForFinished(10000);
+    }
 
     // A server that never answers: the connect gives up after its time-out.
     {
