@@ -157,6 +157,30 @@ void FbAttachment::disconnect()
     guard([&] { handle->detach(&st); }, {}, [handle] { handle->release(); });
 }
 
+bool FbAttachment::ping()
+{
+    if (!d->handle)
+        return false;
+    try {
+        fbapi::Status st;
+        guard([&] { d->handle->ping(&st); });
+        return true;
+    } catch (const DatabaseError&) {
+    }
+    if (d->beforeDisconnect) {
+        try {
+            d->beforeDisconnect();
+        } catch (const std::exception&) {
+            // Whatever the hook wanted to end ended with the connection.
+        }
+    }
+    d->releaseDependents();
+    IAttachment* handle = d->handle;
+    d->handle = nullptr;
+    handle->release();
+    return false;
+}
+
 void FbAttachment::executeImmediate(const QString& sql, FbTransaction& transaction)
 {
     IAttachment* att = d->require();

@@ -35,6 +35,10 @@ public:
     // Closes statements, ends active transactions with their end action, then detaches.
     void disconnect();
     [[nodiscard]] bool isConnected() const;
+    // Whether the server still answers on this connection. One found broken (server stopped,
+    // network gone) is let go without the server: its transactions and statements end, and
+    // isConnected() is false from then on.
+    [[nodiscard]] bool ping();
 
     // Called before the connection goes away (data sets close themselves here).
     void setBeforeDisconnect(std::function<void()> hook);

@@ -131,7 +131,9 @@ bool TDM2::GetDBData(FbAttachment& connection)
 
 bool TDM2::DBConnect()
 {
-    if (IBDatabase1.isConnected())
+    // A connection the server has dropped counts as none, so every operation says so instead of
+    // failing on its first statement.
+    if (IBDatabase1.ping())
         return true;
     reportError(QStringLiteral("# DM2 - DBConnect\r\nKeine Verbindung zur Datenbank!"));
     return false;

@@ -28,7 +28,8 @@ public:
     // Reads database name and credentials from HKEY_LOCAL_MACHINE "software\Varnik\rufwarte"
     // into the connection; reports "# DM2 - GetDBData" on failure and returns false.
     bool GetDBData(FbAttachment& connection);
-    // Whether the connection is up; if not, reports that there is none and returns false.
+    // Whether the connection is up and the server answers on it; if not, reports that there is
+    // none and returns false. A broken connection is let go and stays so (no reconnect).
     bool DBConnect();
 
     // Registry key and values of the connection data.

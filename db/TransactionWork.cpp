@@ -1,8 +1,14 @@
 #include "db/TransactionWork.h"
 
+#include "db/DatabaseError.h"
 #include "db/FbTransaction.h"
 #include "db/TDM2.h"
 #include "platform/ErrorLog.h"
+
+#include <QThread>
+
+#include <algorithm>
+#include <atomic>
 
 namespace orvanta {
 
@@ -17,25 +23,51 @@ void rollbackAndReport(FbTransaction* transaction, QStringView label, const std:
 }
 
 namespace detail {
+namespace {
+std::atomic<long long> g_lockConflictRetries{0};
+} // namespace
+
+long long lockConflictRetries()
+{
+    return g_lockConflictRetries.load();
+}
 
 bool runTransactionWork(FbTransaction& transaction, QStringView label, const std::function<bool()>& work,
                         ErrorReport report)
 {
-    try {
-        TDM2::restart(transaction);
-        if (!work()) {
-            transaction.rollbackQuietly();
+    for (int attempt = 0;; ++attempt) {
+        try {
+            TDM2::restart(transaction);
+            if (!work()) {
+                transaction.rollbackQuietly();
+                return false;
+            }
+            transaction.commit();
+            return true;
+        } catch (const DatabaseError& e) {
+            // Another attachment (the monitor, a second workstation) holds or has just changed the
+            // same rows: a moment later the unit runs against a fresh snapshot and goes through.
+            if (e.isLockConflict() && attempt + 1 < kLockConflictAttempts) {
+                transaction.rollbackQuietly();
+                ++g_lockConflictRetries;
+                QThread::msleep(lockConflictPause(attempt));
+                continue;
+            }
+            rollbackAndReport(&transaction, label, e, report);
             return false;
+        } catch (const std::exception& e) {
+            rollbackAndReport(&transaction, label, e, report);
+            return false;
+        } catch (...) {
+            transaction.rollbackQuietly();
+            throw;
         }
-        transaction.commit();
-        return true;
-    } catch (const std::exception& e) {
-        rollbackAndReport(&transaction, label, e, report);
-        return false;
-    } catch (...) {
-        transaction.rollbackQuietly();
-        throw;
     }
+}
+
+unsigned long lockConflictPause(int attempt)
+{
+    return std::min(25UL << std::min(attempt, 5), 500UL);
 }
 
 } // namespace detail

@@ -15,6 +15,12 @@
 // with the exception ("label\r\nclass / message"), and the result is false: nothing of the unit
 // stays written. Any other exception is rolled back too and passed on.
 //
+// A lock conflict (another attachment changed or holds the same rows; "nowait" transactions meet
+// it at once, waiting ones when the other commits) is not reported: the unit is rolled back and
+// run again from a fresh snapshot after a short pause, up to kLockConflictAttempts times in about
+// three seconds; only a conflict that outlasts them is reported. So the work may run more than
+// once and must not carry anything over from an earlier run.
+//
 // The work returns void or bool. Returning false declines the unit: it is rolled back, nothing is
 // reported, and the result is false, so the caller can say why in its own words once the
 // transaction has ended (e.g. "the record no longer exists").
@@ -37,6 +43,11 @@ class FbTransaction;
 enum class ErrorReport { Show, Log };
 
 namespace detail {
+inline constexpr int kLockConflictAttempts = 10;
+// The pause before the next attempt, in milliseconds, after attempt 0, 1, …
+unsigned long lockConflictPause(int attempt);
+// How many units this process has run again after a lock conflict (for load measurements).
+[[nodiscard]] long long lockConflictRetries();
 bool runTransactionWork(FbTransaction& transaction, QStringView label, const std::function<bool()>& work,
                         ErrorReport report);
 } // namespace detail

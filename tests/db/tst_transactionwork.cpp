@@ -10,8 +10,12 @@
 #include "tests/support/ProgramTestEnv.h"
 #include "tests/support/TestRegistry.h"
 
+#include <QElapsedTimer>
 #include <QFile>
 #include <QTest>
+
+#include <atomic>
+#include <thread>
 
 using namespace orvanta;
 using orvanta::test::ProgramTestEnv;
@@ -56,6 +60,7 @@ public:
         return f.open(QIODevice::ReadOnly) ? QString::fromLatin1(f.readAll()) : QString();
     }
     void exec(const QString& script) { m_env.db().exec(script); }
+    std::unique_ptr<FbAttachment> otherAttachment() { return m_env.db().newAttachment(); }
 
 private:
     ProgramTestEnv m_env;
@@ -72,6 +77,9 @@ private Q_SLOTS:
     void thrownExceptionsRollBackAndAreReported();
     void declinedUnitIsRolledBackWithoutReport();
     void failedStartRunsNothing();
+    void lockConflictsAreRunAgain_data();
+    void lockConflictsAreRunAgain();
+    void lastingLockConflictIsReportedOnce();
 };
 
 void TstTransactionWork::commitsTheWholeUnit()
@@ -197,6 +205,87 @@ void TstTransactionWork::failedStartRunsNothing()
     // The failure half alone, for a transaction that may not exist.
     rollbackAndReport(nullptr, kLabel, DatabaseError(QStringLiteral("weg")));
     QCOMPARE(env.dialogs().last().text, kLabel + QStringLiteral("\r\nEIBInterBaseError / weg"));
+}
+
+void TstTransactionWork::lockConflictsAreRunAgain_data()
+{
+    QTest::addColumn<QStringList>("params");
+    QTest::newRow("nowait: refused at once") << QStringList{QStringLiteral("concurrency"), QStringLiteral("nowait")};
+    QTest::newRow("wait: update conflict when the other commits") << QStringList();
+}
+
+void TstTransactionWork::lockConflictsAreRunAgain()
+{
+    QFETCH(QStringList, params);
+    Env env;
+    env.exec(QStringLiteral("INSERT INTO KAT (LID, KATBEZ) VALUES (1, 'Familie');"));
+
+    // The other writer (the monitor, a second desk) changes the row and commits a moment later.
+    auto other = env.otherAttachment();
+    std::atomic<bool> holding = false;
+    std::thread writer([&] {
+        FbTransaction tx(*other);
+        tx.start();
+        FbStatement st(*other, &tx, QStringLiteral("UPDATE KAT SET KATBEZ = 'Monitor' WHERE LID = 1"));
+        st.execute();
+        holding = true;
+        std::this_thread::sleep_for(std::chrono::milliseconds(300));
+        tx.commit();
+    });
+    while (!holding)
+        std::this_thread::yield();
+
+    FbTransaction tx(env.db(), params);
+    int runs = 0;
+    const bool saved = runInTransaction(tx, kLabel, [&] {
+        ++runs;
+        FbStatement st(env.db(), &tx, QStringLiteral("UPDATE KAT SET KATBEZ = KATBEZ || '+Programm' WHERE LID = 1"));
+        st.execute();
+    });
+    writer.join();
+    QVERIFY(saved);
+    QVERIFY(runs >= 2);
+    // Run again from a fresh snapshot: the other writer's change is kept, not overwritten.
+    QCOMPARE(env.committed(), QStringLiteral("Monitor+Programm"));
+    QCOMPARE(env.dialogs().count(), 0);
+    QVERIFY(!env.errorLogText().contains(kLabel));
+}
+
+void TstTransactionWork::lastingLockConflictIsReportedOnce()
+{
+    Env env;
+    env.exec(QStringLiteral("INSERT INTO KAT (LID, KATBEZ) VALUES (1, 'Familie');"));
+    auto other = env.otherAttachment();
+    FbTransaction otherTx(*other);
+    otherTx.start();
+    FbStatement hold(*other, &otherTx, QStringLiteral("DELETE FROM KAT WHERE LID = 1"));
+    hold.execute();
+
+    FbTransaction tx(env.db(), {QStringLiteral("concurrency"), QStringLiteral("nowait")});
+    int runs = 0;
+    QElapsedTimer timer;
+    timer.start();
+    QVERIFY(!runInTransaction(tx, kLabel, [&] {
+        ++runs;
+        FbStatement st(env.db(), &tx, QStringLiteral("UPDATE KAT SET KATBEZ = 'Programm' WHERE LID = 1"));
+        st.execute();
+    }));
+    QCOMPARE(runs, detail::kLockConflictAttempts);
+    QVERIFY2(timer.elapsed() >= 2000 && timer.elapsed() < 6000, qPrintable(QString::number(timer.elapsed())));
+    QVERIFY(!tx.isActive());
+    QCOMPARE(env.dialogs().count(), 1);
+    QVERIFY2(env.dialogs().last().text.startsWith(kLabel + QStringLiteral("\r\nEIBInterBaseError / ")),
+             qPrintable(env.dialogs().last().text));
+    otherTx.rollback();
+
+    // Any other failure is not run again.
+    runs = 0;
+    QVERIFY(!runInTransaction(tx, kLabel, [&] {
+        ++runs;
+        env.insert(tx, 1, QStringLiteral("Doppelt"));
+    }));
+    QCOMPARE(runs, 1);
+    QCOMPARE(env.dialogs().count(), 2);
 }
 
 ORVANTA_TEST(TstTransactionWork)

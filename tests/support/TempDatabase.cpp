@@ -52,10 +52,15 @@ TempDatabase::TempDatabase(Schema schema)
     if (!m_dir.isValid())
         throw DatabaseError(QStringLiteral("Cannot create a temporary folder"));
     m_path = m_dir.filePath(QStringLiteral("test.fdb"));
+    copySchemaTo(m_path, schema);
+}
+
+void TempDatabase::copySchemaTo(const QString& path, Schema schema)
+{
     const QString source = makeTemplate(schema);
-    if (!QFile::copy(source, m_path))
-        throw DatabaseError(QStringLiteral("Cannot copy %1 to %2").arg(source, m_path));
-    QFile::setPermissions(m_path, QFile::ReadOwner | QFile::WriteOwner);
+    if (!QFile::copy(source, path))
+        throw DatabaseError(QStringLiteral("Cannot copy %1 to %2").arg(source, path));
+    QFile::setPermissions(path, QFile::ReadOwner | QFile::WriteOwner);
 }
 
 TempDatabase::~TempDatabase()

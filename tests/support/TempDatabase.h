@@ -44,6 +44,8 @@ public:
     [[nodiscard]] QVariant scalar(const QString& sql);
 
     [[nodiscard]] static QString schemaPath();
+    // A database file with that schema at `path` (for a server to open); throws DatabaseError.
+    static void copySchemaTo(const QString& path, Schema schema = Schema::Full);
 
 private:
     QTemporaryDir m_dir;
