@@ -391,7 +391,7 @@ void RouterSource::writeQueued()
             say(QStringLiteral("Anruf %1 protokolliert (LID %2).")
                     .arg(call.number.isEmpty() ? QStringLiteral("ohne Nummer") : call.number)
                     .arg(lid));
-            Monitor::tellProgram(MonitorLink::MonitorLogChangedSend, lid);
+            m_notifier.logChanged(lid);
             Q_EMIT callLogged(lid);
             break;
         }

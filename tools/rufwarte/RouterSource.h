@@ -6,6 +6,7 @@
 
 #include "phone/RouterCallMonitor.h"
 #include "tools/rufwarte/Monitor.h"
+#include "tools/rufwarte/ProgramNotifier.h"
 
 #include <QFile>
 #include <QObject>
@@ -89,6 +90,7 @@ private:
 
     std::unique_ptr<FbAttachment> m_db;
     QList<LoggedCall> m_queue;
+    ProgramNotifier m_notifier;
     QString m_queueFile;
     QFile m_journal; // the queue file while calls are appended to it
     bool m_queueSaved = true;
