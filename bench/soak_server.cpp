@@ -180,6 +180,11 @@ public:
     qint64 recurring = 0; // calls from the number the user relinks
 
     static QString number(qint64 n) { return n % 5 == 0 ? QStringLiteral("0301234567") : QStringLiteral("089%1").arg(2000000 + n); }
+    // Every call talks one second longer than the one before, so number and length name a call
+    // even where the number recurs.
+    static qint64 seconds(qint64 n) { return 1 + n; }
+    static QString key(qint64 n) { return callKey(number(n), seconds(n)); }
+    static QString callKey(const QString& number, qint64 seconds) { return number + u'|' + QString::number(seconds); }
 
 private:
     void send()
@@ -195,7 +200,7 @@ private:
             recurring += finished % 5 == 0 ? 1 : 0;
             lines += stamp + ";RING;" + id + ';' + from + ";3012345670;SIP0;\r\n";
             lines += stamp + ";CONNECT;" + id + ";1;" + from + ";\r\n";
-            lines += stamp + ";DISCONNECT;" + id + ';' + QByteArray::number(1 + finished) + ";\r\n";
+            lines += stamp + ";DISCONNECT;" + id + ';' + QByteArray::number(seconds(finished)) + ";\r\n";
         }
         if (!lines.isEmpty())
             m_client->write(lines);
@@ -291,18 +296,18 @@ QStringList errorLogEntries(const QString& path)
     return entries;
 }
 
-// The numbers of today's calls in LOG, each as often as it is there.
+// Today's calls in LOG by number and length, each as often as it is there.
 QHash<QString, int> callsOfToday(const QString& database, const QString& password)
 {
     FbAttachment db;
     db.attach(database, QStringLiteral("SYSDBA"), password);
     FbTransaction tx(db);
     tx.start();
-    FbStatement st(db, &tx, QStringLiteral("SELECT FROMPHONE FROM LOG WHERE TSDATE = CURRENT_DATE"));
+    FbStatement st(db, &tx, QStringLiteral("SELECT FROMPHONE, CTIME FROM LOG WHERE TSDATE = CURRENT_DATE"));
     st.execute();
     QHash<QString, int> numbers;
     while (st.next())
-        ++numbers[st.asString(0)];
+        ++numbers[FakeRouter::callKey(st.asString(0), QTime(0, 0).secsTo(st.asTime(1)))];
     tx.commit();
     return numbers;
 }
@@ -311,14 +316,9 @@ QHash<QString, int> callsOfToday(const QString& database, const QString& passwor
 qint64 missingCalls(qint64 finished, const QHash<QString, int>& stored)
 {
     qint64 missing = 0;
-    qint64 recurring = 0;
-    for (qint64 n = 0; n < finished; ++n) {
-        if (n % 5 == 0)
-            ++recurring;
-        else
-            missing += stored.contains(FakeRouter::number(n)) ? 0 : 1;
-    }
-    return missing + std::max<qint64>(0, recurring - stored.value(FakeRouter::number(0)));
+    for (qint64 n = 0; n < finished; ++n)
+        missing += stored.contains(FakeRouter::key(n)) ? 0 : 1;
+    return missing;
 }
 
 qint64 rows(const QHash<QString, int>& stored)
@@ -600,9 +600,10 @@ int main(int argc, char* argv[])
                 if (fields.size() != 6)
                     continue;
                 ++queued;
-                const QString number = QString::fromLatin1(fields[4]);
-                if (number == FakeRouter::number(0) || !known.contains(number))
-                    ++known[number];
+                // Lines of calls already written stay in the file until it is emptied.
+                const QString key = FakeRouter::callKey(QString::fromLatin1(fields[4]), fields[3].toLongLong());
+                if (!known.contains(key))
+                    known[key] = 1;
             }
         }
     }
