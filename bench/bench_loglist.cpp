@@ -19,6 +19,7 @@
 
 #include "bench/BenchSupport.h"
 #include "calllog/Tlogframe.h"
+#include "db/BackgroundFetch.h"
 #include "db/FbAttachment.h"
 #include "db/FbTransaction.h"
 #include "platform/ProgramFolder.h"
@@ -113,6 +114,26 @@ int main(int argc, char* argv[])
                 dm.ibcds_log.open();
                 std::printf("data set open alone: %.2fx\n", double(d.nsecsElapsed()) / double(raw));
                 dm.ibcds_log.close();
+                const qint64 byKey = bestRawFetch(dm.IBDatabase1, dm.logts, QStringLiteral("SELECT * FROM LOG ORDER BY LID DESC"));
+                std::printf("raw fetch newest first: %.2fx\n", double(byKey) / double(raw));
+                for (const char* key : {"LID", ""}) {
+                    BackgroundFetch::Request request;
+                    request.databaseName = dm.IBDatabase1.databaseName();
+                    request.connectionParams = dm.IBDatabase1.params();
+                    request.sql = QStringLiteral("SELECT * FROM LOG");
+                    request.keyField = QString::fromLatin1(key);
+                    d.restart();
+                    BackgroundFetch fetch(request);
+                    bool done = false;
+                    QObject::connect(&fetch, &BackgroundFetch::finished, [&done] { done = true; });
+                    fetch.start();
+                    while (!done) {
+                        QCoreApplication::processEvents(QEventLoop::WaitForMoreEvents, 5);
+                        (void)fetch.takeBatches();
+                    }
+                    std::printf("background fetch alone (newest by key \"%s\" first): %.2fx\n", key,
+                                double(d.nsecsElapsed()) / double(raw));
+                }
             }
             Host host;
             Tlogframe frame(&dm);

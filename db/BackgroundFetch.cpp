@@ -6,24 +6,20 @@
 
 #include <QMetaObject>
 
+#include <algorithm>
 #include <chrono>
+#include <limits>
 
 namespace orvanta {
 namespace {
 
 std::atomic<int> g_batchDelayMs{0};
-std::atomic<qint64> g_totalRows{0};
 
 } // namespace
 
 void BackgroundFetch::setBatchDelayForTests(int milliseconds)
 {
     g_batchDelayMs.store(milliseconds);
-}
-
-qint64 BackgroundFetch::totalRowsFetched()
-{
-    return g_totalRows.load();
 }
 
 BackgroundFetch::BackgroundFetch(Request request, QObject* parent)
@@ -89,6 +85,39 @@ bool BackgroundFetch::pause()
     return !m_stop.load();
 }
 
+bool BackgroundFetch::fetchAll(FbStatement& statement, int& batchSize, int keyColumn, qint64& lowestKey,
+                               qint64& rows)
+{
+    RecordStore batch;
+    batch.reset(statement);
+    const auto handBatch = [&] {
+        if (keyColumn >= 0) {
+            for (int r = 0; r < batch.rowCount(); ++r)
+                lowestKey = std::min(lowestKey, batch.integer(r, keyColumn));
+        }
+        rows += batch.rowCount();
+        m_rows.fetch_add(batch.rowCount());
+        handOver(std::move(batch));
+        batch = RecordStore();
+        batch.reset(statement);
+    };
+    while (!m_stop.load() && statement.next()) {
+        batch.appendRow(statement);
+        if (batch.rowCount() >= batchSize) {
+            handBatch();
+            batchSize = std::min(batchSize * 2, m_request.largestBatch);
+            if (!pause())
+                return false;
+        }
+    }
+    if (m_stop.load())
+        return false;
+    // An empty result still hands its columns over.
+    if (batch.rowCount() > 0 || rows == 0)
+        handBatch();
+    return true;
+}
+
 void BackgroundFetch::run()
 {
     bool ok = true;
@@ -100,34 +129,32 @@ void BackgroundFetch::run()
                                   {QStringLiteral("read"), QStringLiteral("concurrency"), QStringLiteral("nowait")},
                                   FbTransaction::EndAction::Commit, QStringLiteral("fetch"));
         transaction.start();
-        {
-            FbStatement statement(attachment, &transaction, m_request.sql);
+        const auto bind = [this](FbStatement& statement) {
             for (const QString& n : statement.paramNames())
                 statement.setParam(n, m_request.params.value(n.toUpper()));
+        };
+        const QString& key = m_request.keyField;
+        int batchSize = m_request.firstBatch;
+        qint64 lowest = std::numeric_limits<qint64>::max();
+        qint64 rows = 0;
+        if (key.isEmpty()) {
+            FbStatement statement(attachment, &transaction, m_request.sql);
+            bind(statement);
             statement.execute();
-            int batchSize = m_request.firstBatch;
-            bool handed = false;
-            RecordStore batch;
-            batch.reset(statement);
-            while (!m_stop.load() && statement.next()) {
-                batch.appendRow(statement);
-                if (batch.rowCount() >= batchSize) {
-                    m_rows.fetch_add(batch.rowCount());
-                    g_totalRows.fetch_add(batch.rowCount());
-                    handOver(std::move(batch));
-                    handed = true;
-                    batch = RecordStore();
-                    batch.reset(statement);
-                    batchSize = std::min(batchSize * 2, m_request.largestBatch);
-                    if (!pause())
-                        break;
-                }
-            }
-            // An empty result still hands its columns over.
-            if (!m_stop.load() && (batch.rowCount() > 0 || !handed)) {
-                m_rows.fetch_add(batch.rowCount());
-                g_totalRows.fetch_add(batch.rowCount());
-                handOver(std::move(batch));
+            fetchAll(statement, batchSize, -1, lowest, rows);
+        } else {
+            FbStatement head(attachment, &transaction,
+                             m_request.sql + QStringLiteral(" ORDER BY %1 DESC ROWS %2").arg(key).arg(batchSize));
+            bind(head);
+            head.execute();
+            const int headSize = batchSize;
+            if (fetchAll(head, batchSize, head.columnIndex(key), lowest, rows) && rows >= headSize) {
+                FbStatement rest(attachment, &transaction,
+                                 QStringLiteral("SELECT * FROM (%1) WHERE %2 + 0 < :LOWEST_KEY_HELD").arg(m_request.sql, key));
+                bind(rest);
+                rest.setParam(u"LOWEST_KEY_HELD", QVariant(lowest));
+                rest.execute();
+                fetchAll(rest, batchSize, -1, lowest, rows);
             }
         }
         transaction.commit();

@@ -24,16 +24,22 @@
 
 namespace orvanta {
 
+class FbStatement;
+
 class BackgroundFetch final : public QObject {
     Q_OBJECT
     Q_DISABLE_COPY_MOVE(BackgroundFetch)
 
 public:
+    // With a key field the rows with the highest keys come first, by the key's (descending)
+    // index, firstBatch of them; the rest follows in the table's own order, which the engine
+    // reads fastest: "SELECT * FROM (sql) WHERE key + 0 < :lowest key of the first".
     struct Request {
         QString databaseName;
         QStringList connectionParams; // as FbAttachment takes them
         QString sql;
         QHash<QString, QVariant> params; // by upper-case name
+        QString keyField;
         int firstBatch = 200;
         int largestBatch = 32768;
     };
@@ -52,10 +58,8 @@ public:
     // The failure of a fetch that finished not ok, to rethrow on the owner's thread.
     [[nodiscard]] std::exception_ptr error() const { return m_error; }
 
-    // Test seams: a pause after every batch handed over (the thread still stops at once), and
-    // the rows all fetches of the process have read.
+    // Test seam: a pause after every batch handed over (the thread still stops at once).
     static void setBatchDelayForTests(int milliseconds);
-    [[nodiscard]] static qint64 totalRowsFetched();
 
 Q_SIGNALS:
     void batchesReady();
@@ -64,6 +68,9 @@ Q_SIGNALS:
 
 private:
     void run();
+    // Reads the statement's rows in growing batches; false when stopped. lowestKey: the least
+    // value of the key column among them.
+    bool fetchAll(FbStatement& statement, int& batchSize, int keyColumn, qint64& lowestKey, qint64& rows);
     void handOver(RecordStore&& batch);
     bool pause();
 

@@ -125,7 +125,7 @@ void DataSet::open()
     Q_EMIT opened();
 }
 
-void DataSet::openInBackground(const QString& orderBy)
+void DataSet::openInBackground(const QString& keyField)
 {
     if (m_active)
         return;
@@ -139,25 +139,26 @@ void DataSet::openInBackground(const QString& orderBy)
     m_loadError = nullptr;
     m_active = true;
     m_row = -1;
-    startFetch(orderBy, false);
+    startFetch(keyField, false);
     Q_EMIT opened();
 }
 
-void DataSet::reloadInBackground(const QString& orderBy)
+void DataSet::reloadInBackground(const QString& keyField)
 {
     if (!m_active)
         return;
     stopFetch();
     m_loadError = nullptr;
-    startFetch(orderBy, true);
+    startFetch(keyField, true);
 }
 
-void DataSet::startFetch(const QString& orderBy, bool replacing)
+void DataSet::startFetch(const QString& keyField, bool replacing)
 {
     BackgroundFetch::Request request;
     request.databaseName = m_attachment->databaseName();
     request.connectionParams = m_attachment->params();
-    request.sql = orderBy.isEmpty() ? m_commandText : m_commandText + QStringLiteral(" ORDER BY ") + orderBy;
+    request.sql = m_commandText;
+    request.keyField = keyField;
     request.params = m_params;
     m_replacing = replacing;
     m_pending.clear();

@@ -1,5 +1,6 @@
 #include "tests/support/TestRegistry.h"
 #include "ui/grid/GridController.h"
+#include "ui/grid/GridView.h"
 #include "ui/grid/MemoryGridSource.h"
 
 #include <QRandomGenerator>
@@ -141,6 +142,31 @@ private Q_SLOTS:
         // Nothing new: nothing announced.
         g.sourceAppended();
         QCOMPARE(layout.count(), 1);
+    }
+
+    void arrivingRowsLeaveTheScrollPositionAlone()
+    {
+        QRandomGenerator rnd(3);
+        auto src = makeSource();
+        appendRows(*src, 200, rnd);
+        GridView view;
+        addColumns(*view.controller());
+        view.setSource(src.get());
+        view.resize(400, 300);
+        view.show();
+        view.controller()->setFocusedRow(0);
+        // The user scrolled away from the focused row while the rest arrives.
+        view.scrollToRow(120);
+        const int first = view.firstVisibleRow();
+        QVERIFY(first > 0);
+        appendRows(*src, 500, rnd);
+        view.controller()->sourceAppended();
+        QCOMPARE(view.firstVisibleRow(), first);
+        QCOMPARE(view.controller()->rowCount(), 700);
+        // A real change of the rows still brings the focused row back into view.
+        view.controller()->setSortOrder(1, GridSortOrder::Descending);
+        const int focused = view.controller()->focusedRow();
+        QVERIFY(focused >= view.firstVisibleRow() && focused < view.firstVisibleRow() + 20);
     }
 
     void groupedArrivalsRegroupTheWholeSource()

@@ -239,11 +239,27 @@ void GridController::sourceAppended()
         merged = m_order;
         merged.insert(merged.end(), added.begin(), added.end());
     } else {
-        std::stable_sort(added.begin(), added.end(), less);
+        // Batches mostly come in the order shown or in its reverse: then no sort is needed.
+        const auto strictlyReversed = [&] {
+            for (size_t i = 1; i < added.size(); ++i) {
+                if (!less(added[i], added[i - 1]))
+                    return false;
+            }
+            return true;
+        };
+        if (!std::is_sorted(added.begin(), added.end(), less)) {
+            if (strictlyReversed())
+                std::reverse(added.begin(), added.end());
+            else
+                std::stable_sort(added.begin(), added.end(), less);
+        }
         merged.reserve(m_order.size() + added.size());
         auto from = m_order.begin();
         for (const quint32 record : added) {
-            const auto at = std::upper_bound(from, m_order.end(), record, less);
+            // Where the previous one went is the likeliest place: one comparison then.
+            const auto at = (from == m_order.end() || less(record, *from))
+                                ? from
+                                : std::upper_bound(from, m_order.end(), record, less);
             merged.insert(merged.end(), from, at);
             merged.push_back(record);
             from = at;
@@ -258,8 +274,11 @@ void GridController::sourceAppended()
     m_grouping.buildDisplay();
     restoreFocus(key, false);
     m_pendingLayout = true;
-    if (m_lock == 0)
+    if (m_lock == 0) {
+        m_announcingArrival = true;
         announce();
+        m_announcingArrival = false;
+    }
 }
 
 int GridController::locate(qint64 key) const

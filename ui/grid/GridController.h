@@ -67,6 +67,9 @@ public:
     // relative to each other and the focus stays on its record. Grouped, everything is
     // computed again.
     void sourceAppended();
+    // While the change from sourceAppended() is announced: views keep their scroll position
+    // then instead of moving to the focused row, so arriving rows never pull the view away.
+    [[nodiscard]] bool isAnnouncingArrival() const { return m_announcingArrival; }
     // Source rows the computed order covers (rows beyond arrived and were not announced yet).
     [[nodiscard]] quint32 appliedRowCount() const { return m_appliedRows; }
     void setKeyField(const QString& field) { m_keyFieldName = field; }
@@ -229,6 +232,7 @@ private:
     // Computed (queries apply pending work on demand).
     std::vector<quint32> m_filtered;
     quint32 m_appliedRows = 0;
+    bool m_announcingArrival = false;
     std::vector<quint32> m_order;
     GridGrouping m_grouping;
     int m_focusRow = -1;
