@@ -85,6 +85,7 @@ class TstLogLoading final : public QObject {
 private Q_SLOTS:
     void firstRowsShowWhileTheRestArrivesAndASortHolds();
     void callsInsertedWhileLoadingAppearOnce();
+    void dayDeletedWhileLoadingGoesAfterIt();
     void refreshReadsOnlyWhatChanged();
     void closingMidFetchStopsTheReadAtOnce();
     void databaseGoneMidFetchKeepsTheRowsThatArrived();
@@ -151,6 +152,27 @@ void TstLogLoading::callsInsertedWhileLoadingAppearOnce()
     QCOMPARE(all.first(), kCalls + 1);
     QCOMPARE(env.dm().CurLogLID, kCalls + 1);
     QCOMPARE(lastStatus(env).wParam, kCalls + 1);
+    QCOMPARE(lastStatus(env).lParam, 0);
+}
+
+void TstLogLoading::dayDeletedWhileLoadingGoesAfterIt()
+{
+    LogTestEnv env;
+    fillLog(env, kCalls);
+    BatchDelay delay(150);
+    Tlogframe f(&env.dm());
+    QVERIFY(f.Firstep(&env.host()));
+    QVERIFY(waitForRows(f));
+    // The newest day, on screen already, is deleted while older days still arrive.
+    env.db().exec(QStringLiteral("DELETE FROM LOG WHERE TSDATE = '2024-05-15'"));
+    f.Refresh_View(0);
+    QVERIFY(waitForLog(env.dm()));
+    QVERIFY(waitForLog(env.dm())); // the log is read again once the first reading is through
+    const QList<int> all = lids(f);
+    QCOMPARE(all.size(), kCalls - 50);
+    QCOMPARE(all.first(), kCalls - 50);
+    QCOMPARE(QSet<int>(all.begin(), all.end()).size(), kCalls - 50);
+    QCOMPARE(lastStatus(env).wParam, kCalls - 50);
     QCOMPARE(lastStatus(env).lParam, 0);
 }
 
