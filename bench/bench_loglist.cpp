@@ -131,7 +131,8 @@ int main(int argc, char* argv[])
                 dm.ibcds_log.open();
                 std::printf("data set open alone: %.2fx\n", double(d.nsecsElapsed()) / double(raw));
                 dm.ibcds_log.close();
-                const qint64 byKey = bestRawFetch(dm.IBDatabase1, dm.logts, QStringLiteral("SELECT * FROM LOG ORDER BY LID DESC"));
+                const qint64 byKey = bestRawFetch(dm.IBDatabase1, dm.logts,
+                                                  QStringLiteral("SELECT * FROM LOG ORDER BY TSDATE DESC, TSTIME DESC"));
                 std::printf("raw fetch newest first: %.2fx\n", double(byKey) / double(raw));
                 {
                     FbAttachment other(dm.IBDatabase1.databaseName(), dm.IBDatabase1.params());
@@ -146,12 +147,13 @@ int main(int argc, char* argv[])
                     std::printf("new attachment: connect %.1f ms, first fetch %.2fx, best of 3 %.2fx\n", ms(connect),
                                 double(first) / double(raw), double(best) / double(raw));
                 }
-                for (const char* key : {"LID", ""}) {
+                for (const char* first : {"TSDATE DESC, TSTIME DESC", ""}) {
                     BackgroundFetch::Request request;
                     request.databaseName = dm.IBDatabase1.databaseName();
                     request.connectionParams = dm.IBDatabase1.params();
                     request.sql = QStringLiteral("SELECT * FROM LOG");
-                    request.keyField = QString::fromLatin1(key);
+                    request.firstOrder = QString::fromLatin1(first);
+                    request.keyField = QStringLiteral("LID");
                     d.restart();
                     BackgroundFetch fetch(request);
                     QEventLoop loop;
@@ -159,7 +161,7 @@ int main(int argc, char* argv[])
                     QObject::connect(&fetch, &BackgroundFetch::finished, &loop, &QEventLoop::quit);
                     fetch.start();
                     loop.exec();
-                    std::printf("background fetch alone (newest by key \"%s\" first): %.2fx\n", key,
+                    std::printf("background fetch alone (first \"%s\"): %.2fx\n", first,
                                 double(d.nsecsElapsed()) / double(raw));
                 }
             }

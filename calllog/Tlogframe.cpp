@@ -426,7 +426,8 @@ bool Tlogframe::Firstep(QObject* host)
             // The rows arrive while the window is already usable; the counters are read first,
             // so any change made while they arrive shows at the next refresh.
             m_countersValid = readChangeCounters(m_inserts, m_changes);
-            log.openInBackground(QString::fromLatin1(logsql::kLogKeyField));
+            log.openInBackground(QString::fromLatin1(logsql::kLogFirstOrder),
+                                QString::fromLatin1(logsql::kLogKeyField));
             bindSource();
             if (log.isActive())
                 m_layouts->restore(*controller(), 0);
@@ -895,7 +896,8 @@ void Tlogframe::reloadLog()
 {
     m_countersValid = readChangeCounters(m_inserts, m_changes);
     m_incomplete = false;
-    m_dm->ibcds_log.reloadInBackground(QString::fromLatin1(logsql::kLogKeyField));
+    m_dm->ibcds_log.reloadInBackground(QString::fromLatin1(logsql::kLogFirstOrder),
+                                        QString::fromLatin1(logsql::kLogKeyField));
 }
 
 void Tlogframe::focusKey(int lid)

@@ -8,7 +8,6 @@
 
 #include <algorithm>
 #include <chrono>
-#include <limits>
 
 namespace orvanta {
 namespace {
@@ -85,16 +84,12 @@ bool BackgroundFetch::pause()
     return !m_stop.load();
 }
 
-bool BackgroundFetch::fetchAll(FbStatement& statement, int& batchSize, int keyColumn, qint64& lowestKey,
-                               qint64& rows)
+bool BackgroundFetch::fetchAll(FbStatement& statement, int& batchSize, int keyColumn, const QSet<qint64>* skip,
+                               QSet<qint64>* keys, qint64& rows)
 {
     RecordStore batch;
     batch.reset(statement);
     const auto handBatch = [&] {
-        if (keyColumn >= 0) {
-            for (int r = 0; r < batch.rowCount(); ++r)
-                lowestKey = std::min(lowestKey, batch.integer(r, keyColumn));
-        }
         rows += batch.rowCount();
         m_rows.fetch_add(batch.rowCount());
         handOver(std::move(batch));
@@ -102,6 +97,13 @@ bool BackgroundFetch::fetchAll(FbStatement& statement, int& batchSize, int keyCo
         batch.reset(statement);
     };
     while (!m_stop.load() && statement.next()) {
+        if (keyColumn >= 0) {
+            const qint64 key = statement.asInt64(keyColumn);
+            if (skip && skip->contains(key))
+                continue;
+            if (keys)
+                keys->insert(key);
+        }
         batch.appendRow(statement);
         if (batch.rowCount() >= batchSize) {
             handBatch();
@@ -133,29 +135,27 @@ void BackgroundFetch::run()
             for (const QString& n : statement.paramNames())
                 statement.setParam(n, m_request.params.value(n.toUpper()));
         };
-        const QString& key = m_request.keyField;
         int batchSize = m_request.firstBatch;
-        qint64 lowest = std::numeric_limits<qint64>::max();
         qint64 rows = 0;
-        if (key.isEmpty()) {
-            FbStatement statement(attachment, &transaction, m_request.sql);
-            bind(statement);
-            statement.execute();
-            fetchAll(statement, batchSize, -1, lowest, rows);
-        } else {
+        bool more = true;
+        QSet<qint64> first;
+        const bool split = !m_request.firstOrder.isEmpty() && !m_request.keyField.isEmpty();
+        if (split) {
             FbStatement head(attachment, &transaction,
-                             m_request.sql + QStringLiteral(" ORDER BY %1 DESC ROWS %2").arg(key).arg(batchSize));
+                             m_request.sql
+                                 + QStringLiteral(" ORDER BY %1 ROWS %2").arg(m_request.firstOrder).arg(batchSize));
             bind(head);
             head.execute();
             const int headSize = batchSize;
-            if (fetchAll(head, batchSize, head.columnIndex(key), lowest, rows) && rows >= headSize) {
-                FbStatement rest(attachment, &transaction,
-                                 QStringLiteral("SELECT * FROM (%1) WHERE %2 + 0 < :LOWEST_KEY_HELD").arg(m_request.sql, key));
-                bind(rest);
-                rest.setParam(u"LOWEST_KEY_HELD", QVariant(lowest));
-                rest.execute();
-                fetchAll(rest, batchSize, -1, lowest, rows);
-            }
+            more = fetchAll(head, batchSize, head.columnIndex(m_request.keyField), nullptr, &first, rows)
+                   && rows >= headSize;
+        }
+        if (more) {
+            FbStatement rest(attachment, &transaction, m_request.sql);
+            bind(rest);
+            rest.execute();
+            fetchAll(rest, batchSize, split ? rest.columnIndex(m_request.keyField) : -1, split ? &first : nullptr,
+                     nullptr, rows);
         }
         transaction.commit();
         attachment.disconnect();

@@ -10,6 +10,7 @@
 
 #include <QHash>
 #include <QObject>
+#include <QSet>
 #include <QString>
 #include <QStringList>
 #include <QVariant>
@@ -31,14 +32,16 @@ class BackgroundFetch final : public QObject {
     Q_DISABLE_COPY_MOVE(BackgroundFetch)
 
 public:
-    // With a key field the rows with the highest keys come first, by the key's (descending)
-    // index, firstBatch of them; the rest follows in the table's own order, which the engine
-    // reads fastest: "SELECT * FROM (sql) WHERE key + 0 < :lowest key of the first".
+    // With a first order the first batch is the first firstBatch rows in that order ("TSDATE
+    // DESC, TSTIME DESC", served by an index, so they come at once); the rest follows in the
+    // table's own order, which the engine reads fastest, without the rows the first batch held
+    // (told apart by the key field).
     struct Request {
         QString databaseName;
         QStringList connectionParams; // as FbAttachment takes them
         QString sql;
         QHash<QString, QVariant> params; // by upper-case name
+        QString firstOrder;
         QString keyField;
         int firstBatch = 200;
         int largestBatch = 32768;
@@ -68,9 +71,10 @@ Q_SIGNALS:
 
 private:
     void run();
-    // Reads the statement's rows in growing batches; false when stopped. lowestKey: the least
-    // value of the key column among them.
-    bool fetchAll(FbStatement& statement, int& batchSize, int keyColumn, qint64& lowestKey, qint64& rows);
+    // Reads the statement's rows in growing batches, leaving out those whose key is in skip (when
+    // keyColumn >= 0) and adding the keys read to keys (when given); false when stopped.
+    bool fetchAll(FbStatement& statement, int& batchSize, int keyColumn, const QSet<qint64>* skip,
+                  QSet<qint64>* keys, qint64& rows);
     void handOver(RecordStore&& batch);
     bool pause();
 

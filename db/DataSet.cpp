@@ -125,7 +125,7 @@ void DataSet::open()
     Q_EMIT opened();
 }
 
-void DataSet::openInBackground(const QString& keyField)
+void DataSet::openInBackground(const QString& firstOrder, const QString& keyField)
 {
     if (m_active)
         return;
@@ -139,25 +139,26 @@ void DataSet::openInBackground(const QString& keyField)
     m_loadError = nullptr;
     m_active = true;
     m_row = -1;
-    startFetch(keyField, false);
+    startFetch(firstOrder, keyField, false);
     Q_EMIT opened();
 }
 
-void DataSet::reloadInBackground(const QString& keyField)
+void DataSet::reloadInBackground(const QString& firstOrder, const QString& keyField)
 {
     if (!m_active)
         return;
     stopFetch();
     m_loadError = nullptr;
-    startFetch(keyField, true);
+    startFetch(firstOrder, keyField, true);
 }
 
-void DataSet::startFetch(const QString& keyField, bool replacing)
+void DataSet::startFetch(const QString& firstOrder, const QString& keyField, bool replacing)
 {
     BackgroundFetch::Request request;
     request.databaseName = m_attachment->databaseName();
     request.connectionParams = m_attachment->params();
     request.sql = m_commandText;
+    request.firstOrder = firstOrder;
     request.keyField = keyField;
     request.params = m_params;
     m_replacing = replacing;
@@ -200,7 +201,10 @@ void DataSet::fetchFinished(bool ok)
         m_loadError = fetch->error();
     const bool replaced = m_replacing && ok;
     m_replacing = false;
+    // The buffers grew by half at a time while the rows arrived; the spare goes back now.
+    m_store.squeeze();
     if (replaced) {
+        m_pending.squeeze();
         m_store = std::move(m_pending);
         m_row = m_store.rowCount() > 0 ? 0 : -1;
         Q_EMIT rowsReplaced();

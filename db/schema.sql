@@ -71,9 +71,9 @@ CREATE INDEX IX_LOG_TSDATE ON LOG (TSDATE);
 -- The printed log runs in date and time order: with this index its first page needs no sort of
 -- the whole log.
 CREATE INDEX IX_LOG_TSDATE_TSTIME ON LOG (TSDATE, TSTIME);
--- The log list reads the newest calls first: with this index the first rows come without a sort
--- of the whole log.
-CREATE DESCENDING INDEX IX_LOG_LID_DESC ON LOG (LID);
+-- The log list reads the newest calls first: with this index they come without a sort of the
+-- whole log.
+CREATE DESCENDING INDEX IX_LOG_TSDATE_TSTIME_DESC ON LOG (TSDATE, TSTIME);
 CREATE INDEX IX_LOG_FROMPHONE ON LOG (FROMPHONE);
 CREATE INDEX IX_LOG_FROMSUBB ON LOG (FROMSUBB);
 CREATE INDEX IX_LOG_CID ON LOG (CID);

@@ -3,6 +3,7 @@
 #include "ui/grid/GridCollation.h"
 
 #include <algorithm>
+#include <cmath>
 
 namespace orvanta {
 
@@ -254,12 +255,18 @@ void GridController::sourceAppended()
                 std::stable_sort(added.begin(), added.end(), less);
         }
         merged.reserve(m_order.size() + added.size());
+        // A batch large against the rows shown is merged in one pass; a small one searches.
+        const bool linear = double(added.size()) * std::log2(double(m_order.size()) + 2.0) > double(m_order.size());
         auto from = m_order.begin();
         for (const quint32 record : added) {
             // Where the previous one went is the likeliest place: one comparison then.
-            const auto at = (from == m_order.end() || less(record, *from))
-                                ? from
-                                : std::upper_bound(from, m_order.end(), record, less);
+            auto at = from;
+            if (linear) {
+                while (at != m_order.end() && !less(record, *at))
+                    ++at;
+            } else if (at != m_order.end() && !less(record, *at)) {
+                at = std::upper_bound(from, m_order.end(), record, less);
+            }
             merged.insert(merged.end(), from, at);
             merged.push_back(record);
             from = at;
