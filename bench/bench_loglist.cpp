@@ -152,8 +152,7 @@ int main(int argc, char* argv[])
                     request.databaseName = dm.IBDatabase1.databaseName();
                     request.connectionParams = dm.IBDatabase1.params();
                     request.sql = QStringLiteral("SELECT * FROM LOG");
-                    request.firstOrder = QString::fromLatin1(first);
-                    request.keyField = QStringLiteral("LID");
+                    request.order = QString::fromLatin1(first);
                     d.restart();
                     BackgroundFetch fetch(request);
                     QEventLoop loop;
@@ -161,7 +160,7 @@ int main(int argc, char* argv[])
                     QObject::connect(&fetch, &BackgroundFetch::finished, &loop, &QEventLoop::quit);
                     fetch.start();
                     loop.exec();
-                    std::printf("background fetch alone (first \"%s\"): %.2fx\n", first,
+                    std::printf("background fetch alone (order \"%s\"): %.2fx\n", first,
                                 double(d.nsecsElapsed()) / double(raw));
                 }
             }

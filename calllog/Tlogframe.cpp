@@ -426,8 +426,7 @@ bool Tlogframe::Firstep(QObject* host)
             // The rows arrive while the window is already usable; the counters are read first,
             // so any change made while they arrive shows at the next refresh.
             m_countersValid = readChangeCounters(m_inserts, m_changes);
-            log.openInBackground(QString::fromLatin1(logsql::kLogFirstOrder),
-                                QString::fromLatin1(logsql::kLogKeyField));
+            log.openInBackground(QString::fromLatin1(logsql::kLogFetchOrder));
             bindSource();
             if (log.isActive())
                 m_layouts->restore(*controller(), 0);
@@ -896,8 +895,7 @@ void Tlogframe::reloadLog()
 {
     m_countersValid = readChangeCounters(m_inserts, m_changes);
     m_incomplete = false;
-    m_dm->ibcds_log.reloadInBackground(QString::fromLatin1(logsql::kLogFirstOrder),
-                                        QString::fromLatin1(logsql::kLogKeyField));
+    m_dm->ibcds_log.reloadInBackground(QString::fromLatin1(logsql::kLogFetchOrder));
 }
 
 void Tlogframe::focusKey(int lid)

@@ -84,9 +84,10 @@ bool BackgroundFetch::pause()
     return !m_stop.load();
 }
 
-bool BackgroundFetch::fetchAll(FbStatement& statement, int& batchSize, int keyColumn, const QSet<qint64>* skip,
-                               QSet<qint64>* keys, qint64& rows)
+bool BackgroundFetch::fetchAll(FbStatement& statement)
 {
+    int batchSize = m_request.firstBatch;
+    qint64 rows = 0;
     RecordStore batch;
     batch.reset(statement);
     const auto handBatch = [&] {
@@ -97,13 +98,6 @@ bool BackgroundFetch::fetchAll(FbStatement& statement, int& batchSize, int keyCo
         batch.reset(statement);
     };
     while (!m_stop.load() && statement.next()) {
-        if (keyColumn >= 0) {
-            const qint64 key = statement.asInt64(keyColumn);
-            if (skip && skip->contains(key))
-                continue;
-            if (keys)
-                keys->insert(key);
-        }
         batch.appendRow(statement);
         if (batch.rowCount() >= batchSize) {
             handBatch();
@@ -131,31 +125,15 @@ void BackgroundFetch::run()
                                   {QStringLiteral("read"), QStringLiteral("concurrency"), QStringLiteral("nowait")},
                                   FbTransaction::EndAction::Commit, QStringLiteral("fetch"));
         transaction.start();
-        const auto bind = [this](FbStatement& statement) {
+        {
+            const QString sql = m_request.order.isEmpty()
+                                    ? m_request.sql
+                                    : m_request.sql + QStringLiteral(" ORDER BY ") + m_request.order;
+            FbStatement statement(attachment, &transaction, sql);
             for (const QString& n : statement.paramNames())
                 statement.setParam(n, m_request.params.value(n.toUpper()));
-        };
-        int batchSize = m_request.firstBatch;
-        qint64 rows = 0;
-        bool more = true;
-        QSet<qint64> first;
-        const bool split = !m_request.firstOrder.isEmpty() && !m_request.keyField.isEmpty();
-        if (split) {
-            FbStatement head(attachment, &transaction,
-                             m_request.sql
-                                 + QStringLiteral(" ORDER BY %1 ROWS %2").arg(m_request.firstOrder).arg(batchSize));
-            bind(head);
-            head.execute();
-            const int headSize = batchSize;
-            more = fetchAll(head, batchSize, head.columnIndex(m_request.keyField), nullptr, &first, rows)
-                   && rows >= headSize;
-        }
-        if (more) {
-            FbStatement rest(attachment, &transaction, m_request.sql);
-            bind(rest);
-            rest.execute();
-            fetchAll(rest, batchSize, split ? rest.columnIndex(m_request.keyField) : -1, split ? &first : nullptr,
-                     nullptr, rows);
+            statement.execute();
+            fetchAll(statement);
         }
         transaction.commit();
         attachment.disconnect();

@@ -10,7 +10,6 @@
 
 #include <QHash>
 #include <QObject>
-#include <QSet>
 #include <QString>
 #include <QStringList>
 #include <QVariant>
@@ -32,17 +31,15 @@ class BackgroundFetch final : public QObject {
     Q_DISABLE_COPY_MOVE(BackgroundFetch)
 
 public:
-    // With a first order the first batch is the first firstBatch rows in that order ("TSDATE
-    // DESC, TSTIME DESC", served by an index, so they come at once); the rest follows in the
-    // table's own order, which the engine reads fastest, without the rows the first batch held
-    // (told apart by the key field).
+    // The rows come in the order given ("TSDATE DESC, TSTIME DESC"): with an index that serves
+    // it the engine walks the index, so the first batch is there at once and every batch
+    // continues where the last ended.
     struct Request {
         QString databaseName;
         QStringList connectionParams; // as FbAttachment takes them
         QString sql;
         QHash<QString, QVariant> params; // by upper-case name
-        QString firstOrder;
-        QString keyField;
+        QString order;
         int firstBatch = 200;
         int largestBatch = 32768;
     };
@@ -71,10 +68,8 @@ Q_SIGNALS:
 
 private:
     void run();
-    // Reads the statement's rows in growing batches, leaving out those whose key is in skip (when
-    // keyColumn >= 0) and adding the keys read to keys (when given); false when stopped.
-    bool fetchAll(FbStatement& statement, int& batchSize, int keyColumn, const QSet<qint64>* skip,
-                  QSet<qint64>* keys, qint64& rows);
+    // Reads the statement's rows in growing batches; false when stopped.
+    bool fetchAll(FbStatement& statement);
     void handOver(RecordStore&& batch);
     bool pause();
 

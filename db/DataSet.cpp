@@ -125,7 +125,7 @@ void DataSet::open()
     Q_EMIT opened();
 }
 
-void DataSet::openInBackground(const QString& firstOrder, const QString& keyField)
+void DataSet::openInBackground(const QString& order)
 {
     if (m_active)
         return;
@@ -139,27 +139,26 @@ void DataSet::openInBackground(const QString& firstOrder, const QString& keyFiel
     m_loadError = nullptr;
     m_active = true;
     m_row = -1;
-    startFetch(firstOrder, keyField, false);
+    startFetch(order, false);
     Q_EMIT opened();
 }
 
-void DataSet::reloadInBackground(const QString& firstOrder, const QString& keyField)
+void DataSet::reloadInBackground(const QString& order)
 {
     if (!m_active)
         return;
     stopFetch();
     m_loadError = nullptr;
-    startFetch(firstOrder, keyField, true);
+    startFetch(order, true);
 }
 
-void DataSet::startFetch(const QString& firstOrder, const QString& keyField, bool replacing)
+void DataSet::startFetch(const QString& order, bool replacing)
 {
     BackgroundFetch::Request request;
     request.databaseName = m_attachment->databaseName();
     request.connectionParams = m_attachment->params();
     request.sql = m_commandText;
-    request.firstOrder = firstOrder;
-    request.keyField = keyField;
+    request.order = order;
     request.params = m_params;
     m_replacing = replacing;
     m_pending.clear();

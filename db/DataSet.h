@@ -90,14 +90,13 @@ public:
     void refresh();
 
     // Opens with the columns only and reads the rows on a thread of its own (its own
-    // attachment, a read-only snapshot), appending them as they arrive (rowsArrived): first a
-    // screen of rows in firstOrder, then the rest in the table's order (the key field tells the
-    // rows already read apart). loadFinished() ends the loading; the rows that arrived stay when
-    // it failed. Throws DatabaseError when even the columns cannot be read.
-    void openInBackground(const QString& firstOrder, const QString& keyField);
+    // attachment, a read-only snapshot) in the order given ("TSDATE DESC, TSTIME DESC"),
+    // appending them as they arrive (rowsArrived). loadFinished() ends the loading; the rows
+    // that arrived stay when it failed. Throws DatabaseError when even the columns cannot be read.
+    void openInBackground(const QString& order);
     // Reads the whole result again in the background while the rows held stay; when it is
     // complete they are replaced at once (rowsReplaced). Open data sets only.
-    void reloadInBackground(const QString& firstOrder, const QString& keyField);
+    void reloadInBackground(const QString& order);
     [[nodiscard]] bool isLoading() const { return m_fetch != nullptr; }
     // Why the last loading failed, null when it did not.
     [[nodiscard]] std::exception_ptr loadError() const { return m_loadError; }
@@ -138,7 +137,7 @@ Q_SIGNALS:
     void loadFinished(bool complete);
 
 private:
-    void startFetch(const QString& firstOrder, const QString& keyField, bool replacing);
+    void startFetch(const QString& order, bool replacing);
     void takeBatches();
     void fetchFinished(bool ok);
     void stopFetch() noexcept;
