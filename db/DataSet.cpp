@@ -198,6 +198,10 @@ void DataSet::fetchFinished(bool ok)
     fetch->stop();
     if (!ok)
         m_loadError = fetch->error();
+    // This runs inside the fetch object's own signal: it goes once that has returned (or with
+    // this data set, whichever comes first).
+    fetch->setParent(this);
+    fetch.release()->deleteLater();
     const bool replaced = m_replacing && ok;
     m_replacing = false;
     // The buffers grew by half at a time while the rows arrived; the spare goes back now.
