@@ -125,6 +125,12 @@ void TLogform::WMSTATUSPANEL_(qintptr wParam, qintptr lParam)
         const qint64 count = std::max<qint64>(0, wParam);
         if (lParam == 0)
             m_statusBar->setPanelText(2, QStringLiteral("Protokolleinträge: ") + QString::number(count));
+        else if (lParam == kStatusLogLoading)
+            m_statusBar->setPanelText(2, QStringLiteral("Protokolleinträge: ") + QString::number(count)
+                                             + QStringLiteral(" (wird geladen …)"));
+        else if (lParam == kStatusLogIncomplete)
+            m_statusBar->setPanelText(2, QStringLiteral("Protokolleinträge: ") + QString::number(count)
+                                             + QStringLiteral(" (unvollständig)"));
         else if (lParam == 1)
             m_statusBar->setPanelText(2, QStringLiteral("Kontakte: ") + QString::number(count));
         else

@@ -59,6 +59,8 @@ int main(int argc, char* argv[])
             QObject host;
             Tlogframe frame(&dm);
             frame.Firstep(&host);
+            while (frame.isLoading())
+                QCoreApplication::processEvents(QEventLoop::WaitForMoreEvents, 5);
             GridController* g = frame.controller();
             const int abid = g->columnByField(u"ABID");
             const QStringList excluded = abid >= 0 ? QStringList{g->column(abid).name} : QStringList{};

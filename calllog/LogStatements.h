@@ -5,6 +5,13 @@
 
 namespace orvanta::logsql {
 
+// Log list, whole log: the newest calls first (a descending index serves them), so the first
+// rows that arrive are the ones on screen; after a change only the calls above the highest key
+// held, while the counters the triggers keep show no other change.
+inline constexpr const char* kLogFetchOrder = "TSDATE DESC, TSTIME DESC";
+inline constexpr const char* kSelectLogAbove = "SELECT * FROM LOG WHERE LID > :LID";
+inline constexpr const char* kSelectLogCounters =
+    "SELECT GEN_ID(GEN_LOG_INSERTS, 0), GEN_ID(GEN_LOG_CHANGES, 0) FROM RDB$DATABASE";
 // Log list, day view.
 inline constexpr const char* kSelectLogOfDay = "SELECT * FROM LOG WHERE TSDATE = :TSD";
 // Detail window: one call, and its remark.

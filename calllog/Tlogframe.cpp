@@ -3,6 +3,7 @@
 #include "calllog/LogImages.h"
 #include "calllog/LogStatements.h"
 #include "dbgrid/RecordStoreGridSource.h"
+#include "db/FbStatement.h"
 #include "db/TDM2.h"
 #include "db/TDM2Statements.h"
 #include "db/TransactionWork.h"
@@ -33,6 +34,7 @@
 #include <QStyle>
 
 #include <array>
+#include <limits>
 
 namespace orvanta {
 namespace {
@@ -99,6 +101,9 @@ Tlogframe::Tlogframe(TDM2* dm, QWidget* parent)
             if (!m_refreshing)
                 detachSource();
         });
+        connect(&m_dm->ibcds_log, &DataSet::rowsArrived, this, &Tlogframe::rowsArrived);
+        connect(&m_dm->ibcds_log, &DataSet::rowsReplaced, this, &Tlogframe::rowsReplaced);
+        connect(&m_dm->ibcds_log, &DataSet::loadFinished, this, &Tlogframe::loadFinished);
     }
     connect(m_view, &GridView::focusedRecordChanged, this, &Tlogframe::TableViewFocusedRecordChanged);
     connect(m_view, &GridView::rowDoubleClicked, this, [this](int) {
@@ -406,6 +411,8 @@ bool Tlogframe::Firstep(QObject* host)
     clearFocusedRecord();
     ResetSearchPanel();
     m_noLog = false;
+    m_incomplete = false;
+    m_refreshPending = false;
 
     if (m_viewMode == 0) {
         BusyCursor busy;
@@ -416,7 +423,10 @@ bool Tlogframe::Firstep(QObject* host)
             DataSet& log = m_dm->ibcds_log;
             log.close();
             log.setCommandText(QString::fromLatin1(dmsql::kSelectLog));
-            log.open();
+            // The rows arrive while the window is already usable; the counters are read first,
+            // so any change made while they arrive shows at the next refresh.
+            m_countersValid = readChangeCounters(m_inserts, m_changes);
+            log.openInBackground(QString::fromLatin1(logsql::kLogFetchOrder));
             bindSource();
             if (log.isActive())
                 m_layouts->restore(*controller(), 0);
@@ -470,6 +480,8 @@ bool Tlogframe::OpenDBonDay(QDate day)
                 throw AppException(QStringLiteral("Kein Datenmodul vorhanden."));
             DataSet& log = m_dm->ibcds_log;
             log.close();
+            m_incomplete = false;
+            m_refreshPending = false;
             log.setCommandText(QString::fromLatin1(logsql::kSelectLogOfDay));
             log.setParam(QStringLiteral("TSD"), day.isValid() ? QVariant(day) : QVariant(QMetaType(QMetaType::QDate)));
             log.open();
@@ -595,8 +607,20 @@ void Tlogframe::FocusLastRecord()
     if (!g->isGrouped() || !g->source() || g->source()->rowCount() == 0)
         return;
     g->expandAll(false);
-    // The data set's last record, the newest call: its groups open, its row focused.
-    g->focusRecord(g->source()->rowCount() - 1);
+    // The data set's last record in key order, the newest call (the rows arrive newest first,
+    // and calls read later are appended): its groups open, its row focused.
+    quint32 last = g->source()->rowCount() - 1;
+    if (const int lid = m_fieldIndexes->lid; lid >= 0) {
+        qint64 highest = std::numeric_limits<qint64>::min();
+        for (quint32 r = 0; r < g->source()->rowCount(); ++r) {
+            const qint64 key = g->source()->intValue(r, lid);
+            if (key > highest) {
+                highest = key;
+                last = r;
+            }
+        }
+    }
+    g->focusRecord(last);
 }
 
 bool Tlogframe::CanExpandGroups() const
@@ -762,13 +786,148 @@ void Tlogframe::UpdateLogCaption()
 void Tlogframe::PostLogStatus()
 {
     const int rows = controller()->rowCount();
-    postMessage(m_host, WMSTATUSPANEL, rows < 1 ? 0 : rows, 0);
+    const int state = isLoading() ? kStatusLogLoading : m_incomplete ? kStatusLogIncomplete : 0;
+    postMessage(m_host, WMSTATUSPANEL, rows < 1 ? 0 : rows, state);
+}
+
+bool Tlogframe::isLoading() const
+{
+    return m_dm && m_dm->ibcds_log.isLoading();
+}
+
+void Tlogframe::rowsArrived()
+{
+    if (!controller()->source())
+        return;
+    // Grouped, every batch groups the whole log again: only when it has grown by half, and
+    // once more at the end.
+    const quint32 applied = controller()->appliedRowCount();
+    const quint32 rows = m_source->rowCount();
+    if (controller()->isGrouped() && isLoading() && applied > 0 && rows < applied + applied / 2)
+        return;
+    controller()->sourceAppended();
+    PostLogStatus();
+}
+
+void Tlogframe::rowsReplaced()
+{
+    if (!controller()->source())
+        return;
+    {
+        ViewLock lock(m_view);
+        controller()->sourceChanged();
+        focusKey(m_refreshLid);
+    }
+    m_refreshLid = 0;
+    PostLogStatus();
+}
+
+void Tlogframe::loadFinished(bool complete)
+{
+    if (!m_dm || !controller()->source())
+        return;
+    controller()->sourceAppended();
+    m_incomplete = !complete;
+    if (!complete) {
+        // The rows that arrived stay; the status says the log is incomplete.
+        m_countersValid = false;
+        try {
+            std::rethrow_exception(m_dm->ibcds_log.loadError());
+        } catch (const std::exception& e) {
+            rollbackAndReport(&m_dm->logts, kLabel + QStringLiteral("Firstep"), e);
+        } catch (...) {
+            reportError(kLabel + QStringLiteral("Firstep"));
+        }
+    }
+    PostLogStatus();
+    lf_bemerkungUpdate();
+    if (m_refreshPending) {
+        m_refreshPending = false;
+        Refresh_View(std::exchange(m_refreshLid, 0));
+    }
+}
+
+bool Tlogframe::readChangeCounters(qint64& inserts, qint64& changes)
+{
+    if (!connected())
+        return false;
+    try {
+        FbTransaction& ts = m_dm->logts;
+        if (!ts.isActive())
+            ts.start();
+        FbStatement counters(m_dm->IBDatabase1, &ts, QString::fromLatin1(logsql::kSelectLogCounters));
+        counters.execute();
+        if (!counters.next())
+            return false;
+        inserts = counters.asInt64(0);
+        changes = counters.asInt64(1);
+        return true;
+    } catch (const std::exception&) {
+        // A database without the counters: every refresh reads the whole log.
+        return false;
+    }
+}
+
+bool Tlogframe::readNewCalls()
+{
+    qint64 inserts = 0;
+    qint64 changes = 0;
+    if (!m_countersValid || !readChangeCounters(inserts, changes) || changes != m_changes)
+        return false;
+    const RecordStore& store = m_dm->ibcds_log.store();
+    const int lid = store.fieldIndex(u"LID");
+    if (lid < 0)
+        return false;
+    qint64 highest = 0;
+    for (int r = 0; r < store.rowCount(); ++r)
+        highest = std::max(highest, store.integer(r, lid));
+    const int added = m_dm->ibcds_log.appendQuery(QString::fromLatin1(logsql::kSelectLogAbove),
+                                                  {{QStringLiteral("LID"), QVariant(highest)}});
+    // Inserts counted that are not among the new keys (not committed yet, or below the highest
+    // key held): the log cannot be patched, so it is read again.
+    if (inserts - m_inserts != added)
+        return false;
+    m_inserts = inserts;
+    return true;
+}
+
+void Tlogframe::reloadLog()
+{
+    m_countersValid = readChangeCounters(m_inserts, m_changes);
+    m_incomplete = false;
+    m_dm->ibcds_log.reloadInBackground(QString::fromLatin1(logsql::kLogFetchOrder));
+}
+
+void Tlogframe::focusKey(int lid)
+{
+    if (lid <= 0)
+        return;
+    const int record = controller()->locate(lid);
+    if (record >= 0)
+        controller()->focusRecord(static_cast<quint32>(record));
 }
 
 void Tlogframe::Refresh_View(int lid)
 {
     try {
-        if (m_dm && m_dm->ibcds_log.isActive()) {
+        if (m_dm && m_dm->ibcds_log.isActive() && m_viewMode == 0 && controller()->source()) {
+            if (isLoading()) {
+                // The rows still arriving come from a snapshot: what changed since is read
+                // once they are all there.
+                m_refreshPending = true;
+                m_refreshLid = lid;
+            } else {
+                ViewLock lock(m_view);
+                if (readNewCalls()) {
+                    focusKey(lid);
+                } else {
+                    // The rows held stay on screen until the new reading is complete.
+                    m_refreshLid = lid;
+                    reloadLog();
+                }
+                m_view->setFocus();
+            }
+        } else if (m_dm && m_dm->ibcds_log.isActive()) {
             BusyCursor busy;
             ViewLock lock(m_view);
             m_refreshing = true;
@@ -781,11 +940,7 @@ void Tlogframe::Refresh_View(int lid)
             }
             m_refreshing = false;
             controller()->sourceChanged();
-            if (lid > 0) {
-                const int record = controller()->locate(lid);
-                if (record >= 0)
-                    controller()->focusRecord(static_cast<quint32>(record));
-            }
+            focusKey(lid);
             m_view->setFocus();
         }
     } catch (const std::exception& e) {

@@ -49,6 +49,9 @@ public:
     void setCaptionText(const QString& text) override;
     [[nodiscard]] QString captionText() const override;
     [[nodiscard]] bool isBusy() const override { return m_busy; }
+    // The log is still arriving (whole-log view), or reading it failed part way.
+    [[nodiscard]] bool isLoading() const;
+    [[nodiscard]] bool isIncomplete() const { return m_incomplete; }
     void setBusy(bool busy) override { m_busy = busy; }
 
     bool Firstep(QObject* host) override;
@@ -115,6 +118,16 @@ private:
     void clearFocusedRecord();
     void removeSearch();
     [[nodiscard]] bool connected() const;
+    // Arrival of the log read in the background.
+    void rowsArrived();
+    void rowsReplaced();
+    void loadFinished(bool complete);
+    // Refresh_View's cheap path: the new calls only. False when a full re-read is needed.
+    bool readNewCalls();
+    void reloadLog();
+    void focusKey(int lid);
+    // The counters of inserts and of other changes the triggers keep; false when unreadable.
+    bool readChangeCounters(qint64& inserts, qint64& changes);
 
     TDM2* m_dm;
     std::unique_ptr<RecordStoreGridSource> m_source;
@@ -127,6 +140,14 @@ private:
     QString m_filterName;       // FFilterName
     bool m_busy = false;
     bool m_refreshing = false;
+    bool m_incomplete = false;
+    // A refresh asked for while the log was arriving, done when it is complete.
+    bool m_refreshPending = false;
+    int m_refreshLid = 0;
+    // The change counters as they stood before the rows held were read; invalid when unknown.
+    bool m_countersValid = false;
+    qint64 m_inserts = 0;
+    qint64 m_changes = 0;
     int m_abidColumn = -1;
 
     std::unique_ptr<ListFrameScaffold> m_scaffold;

@@ -9,11 +9,13 @@
 #include <QObject>
 #include <QVariant>
 
+#include <exception>
 #include <functional>
 #include <memory>
 
 namespace orvanta {
 
+class BackgroundFetch;
 class FbAttachment;
 class FbTransaction;
 class DataSet;
@@ -86,6 +88,23 @@ public:
     bool openWithRowsOf(DataSet& other);
     // Close and open again: a new snapshot with the same text and parameters.
     void refresh();
+
+    // Opens with the columns only and reads the rows on a thread of its own (its own
+    // attachment, a read-only snapshot) in the order given ("TSDATE DESC, TSTIME DESC"),
+    // appending them as they arrive (rowsArrived). loadFinished() ends the loading; the rows
+    // that arrived stay when it failed. Throws DatabaseError when even the columns cannot be read.
+    void openInBackground(const QString& order);
+    // Reads the whole result again in the background while the rows held stay; when it is
+    // complete they are replaced at once (rowsReplaced). Open data sets only.
+    void reloadInBackground(const QString& order);
+    [[nodiscard]] bool isLoading() const { return m_fetch != nullptr; }
+    // Why the last loading failed, null when it did not.
+    [[nodiscard]] std::exception_ptr loadError() const { return m_loadError; }
+    // Runs a query of the same columns in the data set's transaction (started afresh, so it
+    // sees what was committed since) and appends its rows; returns how many.
+    int appendQuery(const QString& sql, const QHash<QString, QVariant>& params);
+    // Rows read from the database by every data set of the process (test seam).
+    [[nodiscard]] static qint64 rowsRead();
     // Runs the command text as a statement that returns no rows (DELETE, UPDATE …) in the data
     // set's transaction, without hooks; returns the rows changed. Throws DatabaseError.
     qint64 execSQL();
@@ -112,8 +131,17 @@ Q_SIGNALS:
     void opened();
     void aboutToClose();
     void closed();
+    // Rows from firstRow on were appended.
+    void rowsArrived(int firstRow);
+    void rowsReplaced();
+    void loadFinished(bool complete);
 
 private:
+    void startFetch(const QString& order, bool replacing);
+    void takeBatches();
+    void fetchFinished(bool ok);
+    void stopFetch() noexcept;
+
     // close(), handing the rows out instead of dropping them.
     RecordStore takeRowsAndClose();
 
@@ -125,6 +153,10 @@ private:
     Hook m_afterClose;
     Hook m_afterPost;
     RecordStore m_store;
+    RecordStore m_pending; // a reload's rows until they are complete
+    std::unique_ptr<BackgroundFetch> m_fetch;
+    bool m_replacing = false;
+    std::exception_ptr m_loadError;
     bool m_active = false;
     int m_row = -1;
 };

@@ -4,7 +4,9 @@
 #include "db/FbStatement.h"
 #include "db/FixedPoint.h"
 
+#include <bit>
 #include <cmath>
+#include <stdexcept>
 #include <cstdlib>
 #include <cstring>
 #include <new>
@@ -282,6 +284,56 @@ void RecordStore::appendRow(const FbStatement& statement)
         }
     }
     ++m_rows;
+}
+
+bool RecordStore::sameColumns(const RecordStore& other) const
+{
+    if (m_columns.size() != other.m_columns.size())
+        return false;
+    for (size_t i = 0; i < m_columns.size(); ++i) {
+        const Field& a = m_fields[qsizetype(i)];
+        const Field& b = other.m_fields[qsizetype(i)];
+        if (a.name != b.name || a.type != b.type || a.width != b.width || a.scale != b.scale
+            || m_columns[i].storage != other.m_columns[i].storage)
+            return false;
+    }
+    return true;
+}
+
+void RecordStore::appendRows(const RecordStore& other)
+{
+    if (other.m_rows == 0)
+        return;
+    if (!sameColumns(other))
+        throw std::invalid_argument("RecordStore::appendRows: the columns differ");
+    const int base = m_rows;
+    for (size_t i = 0; i < m_columns.size(); ++i) {
+        Column& c = m_columns[i];
+        const Column& o = other.m_columns[i];
+        if (c.storage == Storage::Text) {
+            const quint32 shift = base == 0 ? 0 : c.offsets()[base - 1];
+            if (c.arena.size + o.arena.size > 0xFFFFFFFFu)
+                throw std::bad_alloc();
+            if (o.arena.size > 0)
+                std::memcpy(c.arena.grow(o.arena.size), o.arena.data, o.arena.size);
+            auto* ends = reinterpret_cast<quint32*>(c.data.grow(size_t(other.m_rows) * 4));
+            const quint32* theirs = o.offsets();
+            for (int r = 0; r < other.m_rows; ++r)
+                ends[r] = theirs[r] + shift;
+        } else {
+            const size_t bytes = size_t(other.m_rows) * c.width;
+            std::memcpy(c.data.grow(bytes), o.data.data, bytes);
+        }
+        for (size_t w = 0; w < o.nulls.size(); ++w) {
+            for (quint64 bits = o.nulls[w]; bits != 0; bits &= bits - 1) {
+                const int r = int(w * 64) + std::countr_zero(bits);
+                if (r < other.m_rows)
+                    setNull(c, base + r);
+            }
+        }
+    }
+    m_rows += other.m_rows;
+    m_valueBytes += other.m_valueBytes;
 }
 
 void RecordStore::squeeze()

@@ -52,6 +52,11 @@ public:
     void clear(); // no columns, no rows
     // Copies the statement's current row (blobs are read whole).
     void appendRow(const FbStatement& statement);
+    // Appends every row of a store of the same columns (a batch fetched elsewhere); throws
+    // std::invalid_argument when the columns differ.
+    void appendRows(const RecordStore& other);
+    // Whether the other store has the same columns (name, type, width, scale).
+    [[nodiscard]] bool sameColumns(const RecordStore& other) const;
     // Gives back the spare capacity of the growing buffers.
     void squeeze();
 

@@ -28,6 +28,11 @@ CREATE GENERATOR GEN_E_MAIL_ID;
 CREATE GENERATOR GEN_KAT_ID;
 CREATE GENERATOR GEN_CONKAT_ID;
 CREATE GENERATOR GEN_ADDR_ID;
+-- Counters of the changes to LOG, kept by its triggers: the log list re-reads only the new calls
+-- when no row changed or went away since it read the log, and the inserts counted match the new
+-- rows it finds. Generators, as they count outside transactions and never conflict.
+CREATE GENERATOR GEN_LOG_INSERTS;
+CREATE GENERATOR GEN_LOG_CHANGES;
 
 /* ---------------------------------------------------------------- tables */
 
@@ -66,6 +71,9 @@ CREATE INDEX IX_LOG_TSDATE ON LOG (TSDATE);
 -- The printed log runs in date and time order: with this index its first page needs no sort of
 -- the whole log.
 CREATE INDEX IX_LOG_TSDATE_TSTIME ON LOG (TSDATE, TSTIME);
+-- The log list reads the newest calls first: with this index they come without a sort of the
+-- whole log.
+CREATE DESCENDING INDEX IX_LOG_TSDATE_TSTIME_DESC ON LOG (TSDATE, TSTIME);
 CREATE INDEX IX_LOG_FROMPHONE ON LOG (FROMPHONE);
 CREATE INDEX IX_LOG_FROMSUBB ON LOG (FROMSUBB);
 CREATE INDEX IX_LOG_CID ON LOG (CID);
@@ -172,6 +180,20 @@ BEGIN
     IF (NEW.CTIME IS NULL) THEN NEW.CTIME = '00:00:00';
     IF (NEW.CCHARGE IS NULL) THEN NEW.CCHARGE = 0;
     IF (NEW.ABID IS NULL) THEN NEW.ABID = 0;
+END^
+
+CREATE TRIGGER LOG_AI FOR LOG ACTIVE AFTER INSERT POSITION 0
+AS
+DECLARE VARIABLE N BIGINT;
+BEGIN
+    N = GEN_ID(GEN_LOG_INSERTS, 1);
+END^
+
+CREATE TRIGGER LOG_AUD FOR LOG ACTIVE AFTER UPDATE OR DELETE POSITION 0
+AS
+DECLARE VARIABLE N BIGINT;
+BEGIN
+    N = GEN_ID(GEN_LOG_CHANGES, 1);
 END^
 
 CREATE TRIGGER CONTACT_BI FOR CONTACT ACTIVE BEFORE INSERT POSITION 0

@@ -17,6 +17,10 @@ inline constexpr int WMSAVECONDATA = WM_USER + 803;
 inline constexpr int WMLOGINFOCHANGE = WM_USER + 805;
 inline constexpr int WMEXPORTGAUGE = WM_USER + 806;
 inline constexpr int WMSTATUSPANEL = WM_USER + 807;
+// lParam of WMSTATUSPANEL beside 0 (log entries) and 1 (contacts): the log entries so far while
+// the log is still being read, and those that arrived before reading it failed.
+inline constexpr int kStatusLogLoading = 2;
+inline constexpr int kStatusLogIncomplete = 3;
 inline constexpr int WMNEWCONTACT = WM_USER + 808;
 inline constexpr int WMOPENCONTACT = WM_USER + 809;
 inline constexpr int WMDELETECONTACT = WM_USER + 810;

@@ -39,6 +39,7 @@ private Q_SLOTS:
         w.show();
         auto* frame = dynamic_cast<Tlogframe*>(w.logFrame());
         QVERIFY(frame);
+        QTRY_VERIFY(!frame->isLoading());
         GridController* grid = frame->controller();
         const int abid = grid->columnByField(u"ABID");
         QVERIFY(abid >= 0);
@@ -135,6 +136,7 @@ private Q_SLOTS:
         w.show();
         auto* log = dynamic_cast<Tlogframe*>(w.logFrame());
         QVERIFY(log);
+        QTRY_VERIFY(!log->isLoading());
         log->ToGroup(LogGrouping::Date);
 
         QTemporaryDir dir;

@@ -1,6 +1,8 @@
 #include "app/MainWindowFeatures.h"
 #include "app/ProgramLauncher.h"
 #include "app/TLogform.h"
+#include "calllog/Tlogframe.h"
+#include "db/BackgroundFetch.h"
 #include "platform/IniFile.h"
 #include "tests/app/AppTestEnv.h"
 #include "tests/support/TestRegistry.h"
@@ -387,7 +389,35 @@ private Q_SLOTS:
         QCOMPARE(status->panelText(2), QStringLiteral("Kontakte: 12"));
         sendMessage(&w, WMSTATUSPANEL, 12, 7);
         QCOMPARE(status->panelText(2), QString());
+        sendMessage(&w, WMSTATUSPANEL, 200, kStatusLogLoading);
+        QCOMPARE(status->panelText(2), QStringLiteral("Protokolleinträge: 200 (wird geladen …)"));
+        sendMessage(&w, WMSTATUSPANEL, 400, kStatusLogIncomplete);
+        QCOMPARE(status->panelText(2), QStringLiteral("Protokolleinträge: 400 (unvollständig)"));
         QVERIFY(!w.isBusy());
+    }
+
+    void windowIsUpBeforeTheLogHasArrived()
+    {
+        AppTestEnv env;
+        env.db().exec(QStringLiteral("SET TERM ^ ;\nEXECUTE BLOCK AS DECLARE I INTEGER = 1; BEGIN WHILE (I <= 1000) DO "
+                                     "BEGIN INSERT INTO LOG (LID, TSDATE, TSTIME, FROMPHONE, STATUS) VALUES (:I, "
+                                     "'2024-05-14', '10:00:00', '030' || :I, 'angenommen'); I = I + 1; END END^\n"
+                                     "SET TERM ; ^"));
+        BackgroundFetch::setBatchDelayForTests(200);
+        struct Undelay {
+            ~Undelay() { BackgroundFetch::setBatchDelayForTests(0); }
+        } undelay;
+        TLogform& w = env.window({}, defaultMainWindowFeatures());
+        w.show();
+        auto* log = qobject_cast<Tlogframe*>(w.logFrame());
+        QVERIFY(log);
+        QVERIFY(log->isLoading());
+        QTRY_VERIFY(log->controller()->rowCount() > 0);
+        QVERIFY(log->isLoading());
+        PanelStatusBar* status = w.statusPanels();
+        QTRY_VERIFY(status->panelText(2).endsWith(QStringLiteral(" (wird geladen …)")));
+        QTRY_COMPARE_WITH_TIMEOUT(status->panelText(2), QStringLiteral("Protokolleinträge: 1000"), 20000);
+        QCOMPARE(env.dialogs().count(), 0);
     }
 
     void registriesReuseFreeSlotsAndGrow()

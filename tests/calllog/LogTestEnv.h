@@ -10,6 +10,7 @@
 #include "tests/support/ProgramTestEnv.h"
 
 #include <QCoreApplication>
+#include <QElapsedTimer>
 #include <QFile>
 #include <QTest>
 
@@ -90,5 +91,27 @@ private:
     ProgramTestEnv m_env;
     MessageRecorder m_host;
 };
+
+// Lets the log the data module reads in the background arrive completely; false on timeout.
+inline bool waitForLog(TDM2& dm, int timeoutMs = 30000)
+{
+    QElapsedTimer timer;
+    timer.start();
+    while (dm.ibcds_log.isLoading()) {
+        if (timer.elapsed() > timeoutMs)
+            return false;
+        QCoreApplication::processEvents(QEventLoop::AllEvents, 10);
+    }
+    QCoreApplication::processEvents();
+    return true;
+}
+
+// Firstep, then the whole log arrived.
+template <class Frame>
+bool firstep(Frame& frame, LogTestEnv& env)
+{
+    const bool ok = frame.Firstep(&env.host());
+    return waitForLog(env.dm()) && ok;
+}
 
 } // namespace orvanta::test

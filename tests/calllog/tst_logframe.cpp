@@ -17,6 +17,7 @@
 
 using namespace orvanta;
 using orvanta::test::LogTestEnv;
+using orvanta::test::firstep;
 
 namespace {
 
@@ -100,7 +101,7 @@ void TstLogFrame::newFrameShowsWholeLogNewestFirst()
     fillCalls(env);
     Tlogframe f(&env.dm());
     f.setViewMode(0);
-    QVERIFY(f.Firstep(&env.host()));
+    QVERIFY(firstep(f, env));
     QCOMPARE(lids(f), (QList<int>{5, 4, 3, 2, 1, 6}));
     const GridController* g = f.controller();
     QCOMPARE(g->sortedColumns(), (std::vector<int>{column(f, "TSDATE"), column(f, "TSTIME")}));
@@ -148,7 +149,7 @@ void TstLogFrame::storedLayoutKeepsItsSortAndCannotShowHiddenColumns()
     fillCalls(env);
     {
         Tlogframe f(&env.dm());
-        f.Firstep(&env.host());
+        firstep(f, env);
         GridController* g = f.controller();
         g->headerClicked(column(f, "FROMBEZ"), Qt::NoModifier);
         g->setColumnVisible(column(f, "ABID"), true);
@@ -156,7 +157,7 @@ void TstLogFrame::storedLayoutKeepsItsSortAndCannotShowHiddenColumns()
         QVERIFY(f.StoreLogView());
     }
     Tlogframe f(&env.dm());
-    f.Firstep(&env.host());
+    firstep(f, env);
     const GridController* g = f.controller();
     QCOMPARE(g->sortedColumns(), std::vector<int>{column(f, "FROMBEZ")});
     // Display text order: "Anders", "Meier" x2, "Schulz", "Unbekannt" (no name, no number),
@@ -186,7 +187,7 @@ void TstLogFrame::damagedLayoutFilesFallBackToDefault()
     fillCalls(env);
     env.writeFile(QStringLiteral("VStoreL"), content);
     Tlogframe f(&env.dm());
-    QVERIFY(f.Firstep(&env.host()));
+    QVERIFY(firstep(f, env));
     QCOMPARE(lids(f), (QList<int>{5, 4, 3, 2, 1, 6}));
     QVERIFY(f.controller()->isColumnVisible(column(f, "FROMBEZ")));
     QVERIFY(!f.controller()->isGrouped());
@@ -203,7 +204,7 @@ void TstLogFrame::periodFilterAppliedOnceAndCleared()
     LogTestEnv env;
     fillCalls(env);
     Tlogframe f(&env.dm());
-    f.Firstep(&env.host());
+    firstep(f, env);
     GridController* g = f.controller();
 
     f.SetNewFilter(2);
@@ -226,7 +227,7 @@ void TstLogFrame::periodFilterAppliedOnceAndCleared()
     // The stored layout carries the filter into the next frame, and WhatsOn reports it.
     QVERIFY(f.StoreLogView());
     Tlogframe next(&env.dm());
-    next.Firstep(&env.host());
+    firstep(next, env);
     int filterKind = -1;
     LogGrouping groupKind = LogGrouping(-1);
     next.WhatsOn(filterKind, groupKind);
@@ -262,7 +263,7 @@ void TstLogFrame::displayRulesOfCallerServiceAndDirection()
     LogTestEnv env;
     fillCalls(env);
     Tlogframe f(&env.dm());
-    f.Firstep(&env.host());
+    firstep(f, env);
     QCOMPARE(cell(f, 4, "FROMBEZ"), QStringLiteral("Unbekannt"));
     QCOMPARE(cell(f, 5, "FROMBEZ"), QStringLiteral("0893333"));
     QCOMPARE(cell(f, 1, "FROMBEZ"), QStringLiteral("Meier"));
@@ -313,7 +314,7 @@ void TstLogFrame::oddValuesInTypedColumns()
     env.db().exec(QStringLiteral("INSERT INTO LOG (LID, TSDATE, TSTIME, FROMBEZ, CTYPE, SERVICE, ABID) VALUES "
                                  "(3, NULL, NULL, NULL, '99999999', '12', '')"));
     Tlogframe f(&env.dm());
-    QVERIFY(f.Firstep(&env.host()));
+    QVERIFY(firstep(f, env));
     QCOMPARE(f.controller()->rowCount(), 3);
     QCOMPARE(cell(f, 1, "CTYPE"), QStringLiteral("Unbekannt"));
     QCOMPARE(cell(f, 2, "CTYPE"), QStringLiteral("Ausgang"));
@@ -349,7 +350,7 @@ void TstLogFrame::groupingByCallerAndBack()
     LogTestEnv env;
     fillCalls(env);
     Tlogframe f(&env.dm());
-    f.Firstep(&env.host());
+    firstep(f, env);
     GridController* g = f.controller();
     const int anrufer = column(f, "FROMBEZ");
 
@@ -399,7 +400,7 @@ void TstLogFrame::focusedRowDrivesActionsAndMessages()
     LogTestEnv env;
     fillCalls(env);
     Tlogframe f(&env.dm());
-    f.Firstep(&env.host());
+    firstep(f, env);
     GridController* g = f.controller();
     env.host().clear();
 
@@ -487,7 +488,7 @@ void TstLogFrame::searchFindsNarrowsClearsAndCloses()
     f.resize(900, 400);
     f.show();
     QVERIFY(QTest::qWaitForWindowActive(&f));
-    f.Firstep(&env.host());
+    firstep(f, env);
     auto* panel = f.findChild<QWidget*>(QStringLiteral("RzPanel1"));
     auto* edit = f.findChild<QLineEdit*>(QStringLiteral("cxTE1"));
     QCOMPARE(panel->height(), 1);
@@ -622,7 +623,7 @@ void TstLogFrame::columnMenuFollowsVisibility()
     LogTestEnv env;
     fillCalls(env);
     Tlogframe f(&env.dm());
-    f.Firstep(&env.host());
+    firstep(f, env);
     GridController* g = f.controller();
     QAction* region = f.popupMenu()->findChild<QAction*>(QStringLiteral("Region1"));
     QVERIFY(region->isChecked());
@@ -665,7 +666,7 @@ void TstLogFrame::dayModeAndRefresh()
     Tlogframe f(&env.dm());
     f.setViewMode(1);
     f.setLogDay(QDate(2024, 5, 14));
-    QVERIFY(f.Firstep(&env.host()));
+    QVERIFY(firstep(f, env));
     QCOMPARE(lids(f), (QList<int>{3, 2}));
     QCOMPARE(f.captionText(), QStringLiteral("Anrufprotokoll vom 14.05.2024"));
     QCOMPARE(lastStatus(env), 2);
@@ -703,7 +704,7 @@ void TstLogFrame::databaseGoneKeepsTheFrameUsable()
     LogTestEnv env;
     fillCalls(env);
     Tlogframe f(&env.dm());
-    f.Firstep(&env.host());
+    firstep(f, env);
     env.dm().IBDatabase1.disconnect();
     QCOMPARE(f.controller()->rowCount(), 0);
     f.Refresh_View(3);
@@ -716,7 +717,7 @@ void TstLogFrame::databaseGoneKeepsTheFrameUsable()
 
     // Opening again fails with the report and leaves an empty, usable frame.
     Tlogframe again(&env.dm());
-    QVERIFY(again.Firstep(&env.host()));
+    QVERIFY(firstep(again, env));
     QCOMPARE(env.dialogs().count(), 1);
     QVERIFY(env.dialogs().last().text.startsWith(QStringLiteral("# Logframe - Firstep")));
     QCOMPARE(again.controller()->rowCount(), 0);
@@ -731,7 +732,7 @@ void TstLogFrame::withoutADataModuleNothingIsRead()
     fillCalls(env);
     env.dm().CurLogLID = 3; // a connected module with a focused call exists in the process
     Tlogframe f(nullptr);
-    QVERIFY(f.Firstep(&env.host()));
+    QVERIFY(firstep(f, env));
     QCOMPARE(env.dialogs().count(), 1);
     QVERIFY(env.dialogs().last().text.startsWith(QStringLiteral("# Logframe - Firstep")));
     QCOMPARE(f.controller()->rowCount(), 0);

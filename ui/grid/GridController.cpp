@@ -1,6 +1,9 @@
 #include "ui/grid/GridController.h"
 
+#include "ui/grid/GridCollation.h"
+
 #include <algorithm>
+#include <cmath>
 
 namespace orvanta {
 
@@ -177,6 +180,112 @@ void GridController::sourceChanged()
     if (record < 0)
         m_focusKey.groupLevel = -1;
     invalidate(DirtyFilter | DirtySort | DirtyGroups | DirtyDisplay);
+}
+
+int GridController::compareRecords(int c, quint32 a, quint32 b) const
+{
+    const GridColumnState& s = m_columns[static_cast<size_t>(c)];
+    if (s.textKey)
+        return gridcollation::compare(s.keyText(*m_source, a), s.keyText(*m_source, b));
+    if (s.field < 0)
+        return 0;
+    const bool nullA = m_source->isNull(a, s.field);
+    const bool nullB = m_source->isNull(b, s.field);
+    if (nullA || nullB)
+        return int(nullB) - int(nullA); // null first, as its rank is the lowest
+    if (m_source->fieldType(s.field) == GridFieldType::Double) {
+        const double x = m_source->doubleValue(a, s.field);
+        const double y = m_source->doubleValue(b, s.field);
+        return x < y ? -1 : (y < x ? 1 : 0);
+    }
+    const qint64 x = m_source->intValue(a, s.field);
+    const qint64 y = m_source->intValue(b, s.field);
+    return x < y ? -1 : (y < x ? 1 : 0);
+}
+
+void GridController::sourceAppended()
+{
+    if (!m_source)
+        return;
+    ensureApplied();
+    const quint32 from = m_appliedRows;
+    if (m_source->rowCount() <= from)
+        return;
+    // Ranks are per source content: the new rows make them stale for any later full sort.
+    m_sorter.invalidateRanks();
+    if (isGrouped()) {
+        invalidate(DirtyFilter | DirtySort | DirtyGroups | DirtyDisplay);
+        return;
+    }
+    const size_t before = m_filtered.size();
+    m_rowFilter.apply(*m_source, m_columns, m_filtered, from);
+    m_appliedRows = m_source->rowCount();
+    if (m_filtered.size() == before)
+        return;
+    std::vector<quint32> added(m_filtered.begin() + static_cast<std::ptrdiff_t>(before), m_filtered.end());
+    const std::vector<int>& keys = m_sorter.sortedColumns();
+    const auto less = [this, &keys](quint32 a, quint32 b) {
+        for (const int c : keys) {
+            const int cmp = compareRecords(c, a, b);
+            if (cmp != 0)
+                return m_columns[static_cast<size_t>(c)].sortOrder == GridSortOrder::Descending ? cmp > 0 : cmp < 0;
+        }
+        return false;
+    };
+    // The new records are the highest indexes: after every equal one already shown, as the
+    // stable full sort would place them. Each finds its place by a binary search, so a batch
+    // costs its own size times the log of the rows shown, plus one copy.
+    std::vector<quint32> merged;
+    if (keys.empty()) {
+        merged = m_order;
+        merged.insert(merged.end(), added.begin(), added.end());
+    } else {
+        // Batches mostly come in the order shown or in its reverse: then no sort is needed.
+        const auto strictlyReversed = [&] {
+            for (size_t i = 1; i < added.size(); ++i) {
+                if (!less(added[i], added[i - 1]))
+                    return false;
+            }
+            return true;
+        };
+        if (!std::is_sorted(added.begin(), added.end(), less)) {
+            if (strictlyReversed())
+                std::reverse(added.begin(), added.end());
+            else
+                std::stable_sort(added.begin(), added.end(), less);
+        }
+        merged.reserve(m_order.size() + added.size());
+        // A batch large against the rows shown is merged in one pass; a small one searches.
+        const bool linear = double(added.size()) * std::log2(double(m_order.size()) + 2.0) > double(m_order.size());
+        auto from = m_order.begin();
+        for (const quint32 record : added) {
+            // Where the previous one went is the likeliest place: one comparison then.
+            auto at = from;
+            if (linear) {
+                while (at != m_order.end() && !less(record, *at))
+                    ++at;
+            } else if (at != m_order.end() && !less(record, *at)) {
+                at = std::upper_bound(from, m_order.end(), record, less);
+            }
+            merged.insert(merged.end(), from, at);
+            merged.push_back(record);
+            from = at;
+        }
+        merged.insert(merged.end(), from, m_order.end());
+    }
+    m_order.swap(merged);
+    const FocusKey key = m_focusKey;
+    m_grouping.build([this](int c) -> const std::vector<quint32>& {
+        return m_sorter.ranksOf(c, *m_source, m_columns).rank;
+    });
+    m_grouping.buildDisplay();
+    restoreFocus(key, false);
+    m_pendingLayout = true;
+    if (m_lock == 0) {
+        m_announcingArrival = true;
+        announce();
+        m_announcingArrival = false;
+    }
 }
 
 int GridController::locate(qint64 key) const
@@ -502,6 +611,7 @@ void GridController::apply()
         return;
     const FocusKey key = m_focusKey;
     if (!m_source) {
+        m_appliedRows = 0;
         m_filtered.clear();
         m_order.clear();
         m_grouping.clear();
@@ -509,8 +619,10 @@ void GridController::apply()
         m_focusKey = {};
         return;
     }
-    if (dirty & DirtyFilter)
+    if (dirty & DirtyFilter) {
         m_rowFilter.apply(*m_source, m_columns, m_filtered);
+        m_appliedRows = m_source->rowCount();
+    }
     if (dirty & (DirtyFilter | DirtySort)) {
         m_order = m_filtered;
         m_sorter.sort(m_order, m_sorter.keysAfter(groupedColumns()), *m_source, m_columns);

@@ -62,6 +62,16 @@ public:
     // The source's content changed (re-read): recompute everything, keep the focused record
     // when a key field is set and the key still exists.
     void sourceChanged();
+    // Rows were added at the end of the source (a log still arriving): only they are filtered,
+    // sorted among themselves and merged into the order, so the rows shown keep their places
+    // relative to each other and the focus stays on its record. Grouped, everything is
+    // computed again.
+    void sourceAppended();
+    // While the change from sourceAppended() is announced: views keep their scroll position
+    // then instead of moving to the focused row, so arriving rows never pull the view away.
+    [[nodiscard]] bool isAnnouncingArrival() const { return m_announcingArrival; }
+    // Source rows the computed order covers (rows beyond arrived and were not announced yet).
+    [[nodiscard]] quint32 appliedRowCount() const { return m_appliedRows; }
     void setKeyField(const QString& field) { m_keyFieldName = field; }
     // Record with that key in the key field (or the given field), -1 when none.
     [[nodiscard]] int locate(qint64 key) const;
@@ -199,6 +209,8 @@ private:
     void announce();
     void announceColumns();
     void resolveFields();
+    // Order of two records by the column's sort key (< 0, 0, > 0), ascending.
+    [[nodiscard]] int compareRecords(int c, quint32 a, quint32 b) const;
 
     GridColumnStates m_columns;
     std::vector<int> m_visual;
@@ -219,6 +231,8 @@ private:
 
     // Computed (queries apply pending work on demand).
     std::vector<quint32> m_filtered;
+    quint32 m_appliedRows = 0;
+    bool m_announcingArrival = false;
     std::vector<quint32> m_order;
     GridGrouping m_grouping;
     int m_focusRow = -1;

@@ -110,39 +110,43 @@ bool GridRowFilter::setSearch(const GridSearch& search)
     return true;
 }
 
-void GridRowFilter::apply(const GridSource& source, const GridColumnStates& columns, std::vector<quint32>& out) const
+void GridRowFilter::apply(const GridSource& source, const GridColumnStates& columns, std::vector<quint32>& out,
+                          quint32 from) const
 {
+    if (from == 0)
+        out.clear();
     if (!m_search.isActive()) {
-        applyFilter(source, columns, out);
+        applyFilter(source, columns, out, from);
         return;
     }
     const GridSearchMatcher matcher(m_search, source, columns);
     if (m_search.narrow) {
-        applyFilter(source, columns, out);
+        const size_t before = out.size();
+        applyFilter(source, columns, out, from);
         // Compacted in place: the rows stay ascending, nothing is copied.
-        size_t kept = 0;
-        for (const quint32 r : out) {
-            if (matcher.matches(r))
-                out[kept++] = r;
+        size_t kept = before;
+        for (size_t i = before; i < out.size(); ++i) {
+            if (matcher.matches(out[i]))
+                out[kept++] = out[i];
         }
         out.resize(kept);
         return;
     }
-    out.clear();
     const quint32 n = source.rowCount();
-    for (quint32 r = 0; r < n; ++r) {
+    for (quint32 r = from; r < n; ++r) {
         if (matcher.matches(r))
             out.push_back(r);
     }
 }
 
-void GridRowFilter::applyFilter(const GridSource& source, const GridColumnStates& columns, std::vector<quint32>& out) const
+void GridRowFilter::applyFilter(const GridSource& source, const GridColumnStates& columns, std::vector<quint32>& out,
+                                quint32 from) const
 {
     const quint32 n = source.rowCount();
-    out.clear();
     if (!m_filter.active || m_filter.root.items.empty()) {
-        out.resize(n);
-        std::iota(out.begin(), out.end(), 0u);
+        const size_t before = out.size();
+        out.resize(before + (n > from ? n - from : 0));
+        std::iota(out.begin() + static_cast<std::ptrdiff_t>(before), out.end(), from);
         return;
     }
     const QDate today = m_today();
@@ -236,7 +240,7 @@ void GridRowFilter::applyFilter(const GridSource& source, const GridColumnStates
     if (!single->isList && isPeriodOperator(single->op) && single->column >= 0 && single->field >= 0
         && source.fieldType(single->field) == GridFieldType::Date) {
         const int field = single->field;
-        for (quint32 r = 0; r < n; ++r) {
+        for (quint32 r = from; r < n; ++r) {
             if (source.isNull(r, field))
                 continue;
             const qint64 day = source.intValue(r, field);
@@ -245,7 +249,7 @@ void GridRowFilter::applyFilter(const GridSource& source, const GridColumnStates
         }
         return;
     }
-    for (quint32 r = 0; r < n; ++r) {
+    for (quint32 r = from; r < n; ++r) {
         if (eval(root, r))
             out.push_back(r);
     }

@@ -36,10 +36,14 @@ public:
     [[nodiscard]] QString text(const GridColumnStates& columns) const;
     // Source rows passing the filter, ascending; every row when it is inactive or empty. An
     // active search then keeps the rows it finds: among those (narrowing) or among all rows.
-    void apply(const GridSource& source, const GridColumnStates& columns, std::vector<quint32>& out) const;
+    // With from > 0 only the rows from there on are tested, and those passing are appended to
+    // out, which holds the result for the rows before.
+    void apply(const GridSource& source, const GridColumnStates& columns, std::vector<quint32>& out,
+               quint32 from = 0) const;
 
 private:
-    void applyFilter(const GridSource& source, const GridColumnStates& columns, std::vector<quint32>& out) const;
+    void applyFilter(const GridSource& source, const GridColumnStates& columns, std::vector<quint32>& out,
+                     quint32 from) const;
 
     GridFilter m_filter;
     GridSearch m_search;

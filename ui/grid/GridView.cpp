@@ -94,11 +94,13 @@ GridView::GridView(QWidget* parent)
     connect(m_controller, &GridController::layoutChanged, this, [this] {
         updateGeometries();
         updateScrollBars();
-        ensureRowVisible(m_controller->focusedRow());
+        if (!m_controller->isAnnouncingArrival())
+            ensureRowVisible(m_controller->focusedRow());
         viewport()->update();
     });
     connect(m_controller, &GridController::focusChanged, this, [this](int, int current) {
-        ensureRowVisible(current);
+        if (!m_controller->isAnnouncingArrival())
+            ensureRowVisible(current);
         viewport()->update();
     });
 
