@@ -1,5 +1,7 @@
 #include "db/TDM2.h"
 
+#include "db/SchemaUpgrade.h"
+
 #include "db/DatabaseError.h"
 #include "db/StoredConnection.h"
 #include "db/TDM2Statements.h"
@@ -92,6 +94,7 @@ TDM2::TDM2(QObject* parent)
     if (GetDBData(IBDatabase1)) {
         try {
             IBDatabase1.connect();
+            addMissingLogObjects(IBDatabase1);
         } catch (const std::exception& e) {
             reportError(QStringLiteral("# DM2 - DataModuleCreate"), &e);
         }

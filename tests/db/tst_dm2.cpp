@@ -63,6 +63,7 @@ private Q_SLOTS:
     void unconnectedStarts();
     void listReopenRollsBackAndRestarts();
     void logListSnapshotAndCommit();
+    void olderDatabaseGetsTheLogObjects();
 };
 
 void TstDm2::connectsFromRegistry()
@@ -224,6 +225,62 @@ void TstDm2::logListSnapshotAndCommit()
     mt.commit();
     dm.ibcds_log.close();
     QVERIFY(!dm.logts.isActive());
+}
+
+// A database made before the log's indexes and change counters existed gets them on connect;
+// while another attachment holds LOG in use, the program still connects and logs what it could
+// not add, and the next connect adds it.
+void TstDm2::olderDatabaseGetsTheLogObjects()
+{
+    ScopedScriptedDialogs dialogs;
+    Environment env;
+    TempDatabase db;
+    env.writeGood(db.path());
+    const auto count = [&db](const char* catalogue) { return db.scalar(QString::fromLatin1(catalogue)).toInt(); };
+    const char* objects = "SELECT (SELECT COUNT(*) FROM RDB$INDICES WHERE RDB$INDEX_NAME STARTING 'IX_LOG_TSDATE_TSTIME') "
+                          "+ (SELECT COUNT(*) FROM RDB$GENERATORS WHERE RDB$GENERATOR_NAME IN ('GEN_LOG_INSERTS', "
+                          "'GEN_LOG_CHANGES')) + (SELECT COUNT(*) FROM RDB$TRIGGERS WHERE RDB$TRIGGER_NAME IN "
+                          "('LOG_AI', 'LOG_AUD')) FROM RDB$DATABASE";
+    const auto dropAll = [&db] {
+        for (const char* ddl : {"DROP TRIGGER LOG_AI", "DROP TRIGGER LOG_AUD", "DROP GENERATOR GEN_LOG_INSERTS",
+                                "DROP GENERATOR GEN_LOG_CHANGES", "DROP INDEX IX_LOG_TSDATE_TSTIME",
+                                "DROP INDEX IX_LOG_TSDATE_TSTIME_DESC"})
+            db.exec(QString::fromLatin1(ddl) + u';');
+    };
+    QCOMPARE(count(objects), 6);
+    dropAll();
+    QCOMPARE(count(objects), 0);
+    {
+        TDM2 dm;
+        QVERIFY(dm.IBDatabase1.isConnected());
+    }
+    QCOMPARE(count(objects), 6);
+    // The triggers count into the generators again.
+    db.exec(QStringLiteral("INSERT INTO LOG (LID, FROMPHONE, TSDATE, TSTIME) VALUES (1, '030', '2024-05-01', '10:00:00');"
+                           "UPDATE LOG SET BEMERK = 'x';"));
+    QCOMPARE(count("SELECT GEN_ID(GEN_LOG_INSERTS, 0) FROM RDB$DATABASE"), 1);
+    QCOMPARE(count("SELECT GEN_ID(GEN_LOG_CHANGES, 0) FROM RDB$DATABASE"), 1);
+
+    // The creation of the trigger fails while another attachment has LOG in use: the program
+    // works without it.
+    dropAll();
+    auto other = db.newAttachment();
+    FbTransaction ot(*other);
+    ot.start();
+    FbStatement busy(*other, &ot, QStringLiteral("UPDATE LOG SET BEMERK = 'y'"));
+    busy.execute();
+    {
+        TDM2 dm;
+        QVERIFY(dm.IBDatabase1.isConnected());
+        QVERIFY(dm.DBConnect());
+    }
+    QVERIFY(count(objects) < 6); // the triggers were refused
+    ot.commit();
+    QCOMPARE(dialogs->count(), 0);
+    {
+        TDM2 dm;
+    }
+    QCOMPARE(count(objects), 6);
 }
 
 ORVANTA_TEST(TstDm2)
