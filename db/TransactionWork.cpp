@@ -5,6 +5,7 @@
 #include "db/TDM2.h"
 #include "platform/ErrorLog.h"
 
+#include <QRandomGenerator>
 #include <QThread>
 
 #include <algorithm>
@@ -67,7 +68,10 @@ bool runTransactionWork(FbTransaction& transaction, QStringView label, const std
 
 unsigned long lockConflictPause(int attempt)
 {
-    return std::min(25UL << std::min(attempt, 5), 500UL);
+    // Drawn from half to all of the step: a writer that holds its rows at a steady beat would
+    // otherwise meet every attempt at the same point of its beat.
+    const unsigned long step = std::min(25UL << std::min(attempt, 5), 500UL);
+    return step / 2 + QRandomGenerator::global()->bounded(quint32(step / 2 + 1));
 }
 
 } // namespace detail

@@ -43,7 +43,7 @@ class FbTransaction;
 enum class ErrorReport { Show, Log };
 
 namespace detail {
-inline constexpr int kLockConflictAttempts = 10;
+inline constexpr int kLockConflictAttempts = 12;
 // The pause before the next attempt, in milliseconds, after attempt 0, 1, …
 unsigned long lockConflictPause(int attempt);
 // How many units this process has run again after a lock conflict (for load measurements).
