@@ -122,6 +122,26 @@ void blankGrid(QTableWidget* grid)
     grid->setRowCount(1);
 }
 
+
+// What the entry editors give back, cut to the columns' widths; the rest of the entry (key,
+// state) is taken from `entry`.
+TvkKommItem editedEntry(const Tcomeditform& editor, TvkKommItem entry)
+{
+    entry.KOMMBEZ = cut(editor.KOMMBEZ, TvkKommItem::KOMMBEZWidth);
+    entry.LC = cut(editor.LC, TvkKommItem::LCWidth);
+    entry.VORW = cut(editor.VORW, TvkKommItem::VORWWidth);
+    entry.NUMBER = cut(editor.NUMBER, TvkKommItem::NUMBERWidth);
+    entry.BEMERKUNG = cut(editor.BEMERKUNG, TvkKommItem::BEMERKUNGWidth);
+    entry.AUTOREJECT = editor.AUTOREJECT ? 1 : 0;
+    return entry;
+}
+
+TvkMailItem editedEntry(const Tmaileditform& editor, TvkMailItem entry)
+{
+    entry.MAILADDR = cut(editor.MAILADDR, TvkMailItem::MAILADDRWidth);
+    entry.BEMERK = cut(editor.BEMERK, TvkMailItem::BEMERKWidth);
+    return entry;
+}
 } // namespace
 
 // ---------------------------------------------------------------------------------------------
@@ -837,13 +857,7 @@ void Tcontacteditform::NewComData()
     try {
         Tcomeditform editor(this);
         if (editor.exec() == QDialog::Accepted && editor.ok()) {
-            TvkKommItem e;
-            e.KOMMBEZ = cut(editor.KOMMBEZ, TvkKommItem::KOMMBEZWidth);
-            e.LC = cut(editor.LC, TvkKommItem::LCWidth);
-            e.VORW = cut(editor.VORW, TvkKommItem::VORWWidth);
-            e.NUMBER = cut(editor.NUMBER, TvkKommItem::NUMBERWidth);
-            e.BEMERKUNG = cut(editor.BEMERKUNG, TvkKommItem::BEMERKUNGWidth);
-            e.AUTOREJECT = editor.AUTOREJECT ? 1 : 0;
+            TvkKommItem e = editedEntry(editor, TvkKommItem{});
             e.status = EntryStatus::New;
             r->AddKD(e);
             if (!SetGridLines())
@@ -875,13 +889,7 @@ void Tcontacteditform::EditComData()
         editor.BEMERKUNG = current.BEMERKUNG;
         editor.AUTOREJECT = current.AUTOREJECT != 0;
         if (editor.exec() == QDialog::Accepted && editor.ok()) {
-            TvkKommItem e = current;
-            e.KOMMBEZ = cut(editor.KOMMBEZ, TvkKommItem::KOMMBEZWidth);
-            e.LC = cut(editor.LC, TvkKommItem::LCWidth);
-            e.VORW = cut(editor.VORW, TvkKommItem::VORWWidth);
-            e.NUMBER = cut(editor.NUMBER, TvkKommItem::NUMBERWidth);
-            e.BEMERKUNG = cut(editor.BEMERKUNG, TvkKommItem::BEMERKUNGWidth);
-            e.AUTOREJECT = editor.AUTOREJECT ? 1 : 0;
+            const TvkKommItem e = editedEntry(editor, current);
             r->EditKD(e, index);
             if (!SetGridLines())
                 DisableEditing();
@@ -927,9 +935,7 @@ void Tcontacteditform::NewMailData()
     try {
         Tmaileditform editor(this);
         if (editor.exec() == QDialog::Accepted && editor.ok()) {
-            TvkMailItem e;
-            e.MAILADDR = cut(editor.MAILADDR, TvkMailItem::MAILADDRWidth);
-            e.BEMERK = cut(editor.BEMERK, TvkMailItem::BEMERKWidth);
+            TvkMailItem e = editedEntry(editor, TvkMailItem{});
             e.status = EntryStatus::New;
             r->AddMail(e);
             if (!SetGridMailLines())
@@ -957,9 +963,7 @@ void Tcontacteditform::EditMailData()
         editor.MAILADDR = current.MAILADDR;
         editor.BEMERK = current.BEMERK;
         if (editor.exec() == QDialog::Accepted && editor.ok()) {
-            TvkMailItem e = current;
-            e.MAILADDR = cut(editor.MAILADDR, TvkMailItem::MAILADDRWidth);
-            e.BEMERK = cut(editor.BEMERK, TvkMailItem::BEMERKWidth);
+            const TvkMailItem e = editedEntry(editor, current);
             r->EditMail(e, index);
             if (!SetGridMailLines())
                 DisableEditing();
