@@ -25,6 +25,7 @@
 #include <limits>
 #include <memory>
 #include <optional>
+#include <utility>
 
 namespace orvanta::bench {
 
@@ -112,6 +113,23 @@ inline void pointDataModuleAt(const QString& path)
     registry.writeString(QStringLiteral("Database"), path);
     registry.writeString(QStringLiteral("Username"), CredentialCipher::encrypt(QStringLiteral("SYSDBA")));
     registry.writeString(QStringLiteral("Password"), CredentialCipher::encrypt(QStringLiteral("masterkey")));
+}
+
+// One size's database: made and filled, and the registry pointed at it for the next data module.
+template <typename Fill>
+void prepareDatabase(const QString& path, Fill&& fill)
+{
+    createLogDatabase(path, std::forward<Fill>(fill));
+    pointDataModuleAt(path);
+}
+
+// Whether the data module connected; says which database it could not open when not.
+inline bool dataModuleConnected(const TDM2& dm, const QString& path)
+{
+    if (dm.IBDatabase1.isConnected())
+        return true;
+    std::fprintf(stderr, "cannot connect to %s\n", qPrintable(path));
+    return false;
 }
 
 struct RawResult {

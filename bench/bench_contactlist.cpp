@@ -153,13 +153,10 @@ int main(int argc, char* argv[])
         for (const char* f : {"VStore", "VStoreT", "VStoreC"})
             QFile::remove(temp->filePath(QLatin1String(f)));
         try {
-            createLogDatabase(path, [contacts](FbAttachment& db) { generateContacts(db, contacts, 4711); });
-            pointDataModuleAt(path);
+            prepareDatabase(path, [contacts](FbAttachment& db) { generateContacts(db, contacts, 4711); });
             TDM2 dm;
-            if (!dm.IBDatabase1.isConnected()) {
-                std::fprintf(stderr, "cannot connect to %s\n", qPrintable(path));
+            if (!dataModuleConnected(dm, path))
                 return 1;
-            }
             const qint64 raw = bestRawFetch(dm.IBDatabase1, dm.ibta2, rawSql);
             const qint64 unsorted = bestRawFetch(dm.IBDatabase1, dm.ibta2, QStringLiteral("SELECT * FROM V_SELECT_LIST"));
 

@@ -85,14 +85,11 @@ int main(int argc, char* argv[])
             break;
         const QString path = temp->filePath(QStringLiteral("log%1.fdb").arg(calls));
         try {
-            createLogDatabase(path,
-                              [calls, &lastDay](FbAttachment& db) { demo::generateCalls(db, calls, 4711, lastDay); });
-            pointDataModuleAt(path);
+            prepareDatabase(path,
+                            [calls, &lastDay](FbAttachment& db) { demo::generateCalls(db, calls, 4711, lastDay); });
             TDM2 dm;
-            if (!dm.IBDatabase1.isConnected()) {
-                std::fprintf(stderr, "cannot connect to %s\n", qPrintable(path));
+            if (!dataModuleConnected(dm, path))
                 return 1;
-            }
             const qint64 raw = bestRawFetch(dm.IBDatabase1, dm.logts);
             const qint64 rawCpu = bestRawCpu(dm.IBDatabase1, dm.logts);
 
