@@ -21,9 +21,7 @@ namespace {
 // The shipped report file in the test's program folder.
 void installReports(LogTestEnv& env)
 {
-    QFile file(QStringLiteral(ORVANTA_SOURCE_DIR "/data/Orvex.rav"));
-    QVERIFY(file.open(QIODevice::ReadOnly));
-    env.writeFile(QStringLiteral("Orvex.rav"), file.readAll());
+    env.writeFile(QStringLiteral("Orvex.rav"), shippedReportFile());
 }
 
 void call(LogTestEnv& env, int lid, const char* date, const char* time, int ctype, const char* from, const char* to,
@@ -46,15 +44,6 @@ void fillLog(LogTestEnv& env)
     call(env, 2, "2024-05-15", "17:30:00", 1, "Büro", "Schulz", "01:02:03", "12.5", 1, "Berlin");
     call(env, 3, "2024-05-15", "08:15:00", 0, "Özdemir", "Büro", "00:00:00", "0", 0, "");
     call(env, 4, "2024-05-16", "10:00:00", 0, "Meier", "Büro", "00:00:42", "0", 0, "Bayern");
-}
-
-QStringList lines(const QString& text)
-{
-    QStringList out;
-    for (const QString& l : text.split(u'\n'))
-        if (!l.trimmed().isEmpty())
-            out.append(l.simplified());
-    return out;
 }
 
 } // namespace
@@ -91,7 +80,7 @@ private Q_SLOTS:
         QVERIFY(LogPrint(&env.dm().rave_ibsql, 0, outcome, QDate(), QDate(2024, 5, 15)));
         QCOMPARE(outcome.code, 0);
         QCOMPARE(capture.reports, QStringList{QStringLiteral("LogEinfach")});
-        const QStringList text = lines(capture.text());
+        const QStringList text = pdfLines(capture.text());
         QVERIFY(text.contains(QStringLiteral("Zeitraum: (15.05.2024)")));
         const QString early = QStringLiteral("15.05.2024 08:15 ankommend Özdemir angenommen Büro");
         const QString late = QStringLiteral("15.05.2024 17:30 abgehend Büro angenommen Schulz");

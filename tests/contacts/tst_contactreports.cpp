@@ -18,18 +18,7 @@ namespace {
 
 void installReports(ProgramTestEnv& env)
 {
-    QFile file(QStringLiteral(ORVANTA_SOURCE_DIR "/data/Orvex.rav"));
-    QVERIFY(file.open(QIODevice::ReadOnly));
-    QVERIFY(env.writeFile(QStringLiteral("Orvex.rav"), file.readAll()));
-}
-
-QStringList lines(const QString& text)
-{
-    QStringList out;
-    for (const QString& l : text.split(u'\n'))
-        if (!l.trimmed().isEmpty())
-            out.append(l.simplified());
-    return out;
+    QVERIFY(env.writeFile(QStringLiteral("Orvex.rav"), shippedReportFile()));
 }
 
 } // namespace
@@ -51,7 +40,7 @@ private Q_SLOTS:
         ReportOutcome outcome;
         QVERIFY(DruckKontaktUebersicht(&env.dm().rave_ibsql, outcome));
         QCOMPARE(capture.titles, QStringList{QStringLiteral("Vorschau Kontaktübersicht")});
-        const QStringList text = lines(capture.text());
+        const QStringList text = pdfLines(capture.text());
         QVERIFY2(text.contains(QStringLiteral("Müller GmbH Kunden Hauptstraße 5 50667 Köln")), qPrintable(text.join(u'\n')));
         QCOMPARE(text.filter(QStringLiteral("Ohne Alles")), QStringList{QStringLiteral("Ohne Alles")});
         QVERIFY(text.contains(QStringLiteral("Kontakt Kategorie Straße PLZ Ort")));

@@ -5,7 +5,10 @@
 #include "ui/report/ReportRenderer.h"
 #include "ui/report/ReportRun.h"
 
+#include "tests/TestPaths.h"
+
 #include <QDir>
+#include <QFile>
 #include <QProcess>
 #include <QStringList>
 #include <QTemporaryDir>
@@ -19,6 +22,24 @@ inline QString pdfText(const QString& path)
     p.start(QStringLiteral("pdftotext"), {QStringLiteral("-layout"), path, QStringLiteral("-")});
     p.waitForFinished(60000);
     return QString::fromUtf8(p.readAllStandardOutput());
+}
+
+// The non-empty lines of a page text, blanks run together: what a reader of the page sees,
+// whatever the column spacing.
+inline QStringList pdfLines(const QString& text)
+{
+    QStringList out;
+    for (const QString& l : text.split(u'\n'))
+        if (!l.trimmed().isEmpty())
+            out.append(l.simplified());
+    return out;
+}
+
+// The report file the program ships, for a test's program folder.
+inline QByteArray shippedReportFile()
+{
+    QFile file(QStringLiteral(ORVANTA_SOURCE_DIR "/data/Orvex.rav"));
+    return file.open(QIODevice::ReadOnly) ? file.readAll() : QByteArray();
 }
 
 inline int pdfPages(const QString& path)
